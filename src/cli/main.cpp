@@ -1,0 +1,6 @@
+#include <iostream>
+
+int main() {
+    std::cout << "rcvrchar\n";
+    return 0;
+}
