@@ -1,0 +1,14 @@
+#include "analyzer/UpperCase.h"
+
+#include <algorithm>
+#include <cctype>
+
+namespace analyzer {
+
+std::string upperCased(std::string text) {
+    std::transform(text.begin(), text.end(), text.begin(),
+                   [](unsigned char c) { return static_cast<char>(std::toupper(c)); });
+    return text;
+}
+
+}  // namespace analyzer

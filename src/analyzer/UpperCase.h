@@ -1,0 +1,10 @@
+#pragma once
+
+#include <string>
+
+namespace analyzer {
+
+// Each character as the standard toupper maps it in the "C" locale.
+std::string upperCased(std::string text);
+
+}  // namespace analyzer
