@@ -47,6 +47,11 @@ class CCompressionData {
     float compressionPhase() const { return m_compressionPhase; }
     void setCompressionValue(float value) { m_compressionValue = value; }
     void setCompressionPhase(float phase) { m_compressionPhase = phase; }
+    void setCompressionPoint(float power, float value, float phase) {
+        m_compressionPower = power;
+        m_compressionValue = value;
+        m_compressionPhase = phase;
+    }
 
     const std::vector<double>& getBandStarts() const { return m_bandStarts; }
     const std::vector<double>& getBandStops() const { return m_bandStops; }
