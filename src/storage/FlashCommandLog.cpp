@@ -23,7 +23,17 @@ void FlashCommandLog::create() {
 void FlashCommandLog::append(const std::string& line) {
     std::lock_guard lock(m_mutex);
     std::ofstream out(m_paths.toLocal(kWindowsPath), std::ios::binary | std::ios::app);
-    out << line << "\r\n";
+    // Written as a text-mode file is on the analyzer's computer: every line feed, also those
+    // between the error texts of one entry, becomes CR LF.
+    std::string text;
+    text.reserve(line.size() + 2);
+    for (char c : line) {
+        if (c == '\n') {
+            text += '\r';
+        }
+        text += c;
+    }
+    out << text << "\r\n";
 }
 
 }  // namespace storage

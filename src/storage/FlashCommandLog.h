@@ -21,8 +21,8 @@ class FlashCommandLog {
     // Creates the log afresh with the line "Initialized file"; raises an error text naming
     // the file and the reason when it cannot be written.
     void create();
-    // Appends one line. A log that cannot be opened loses the line and nothing else: the
-    // flash step it records goes on.
+    // Appends one entry; line feeds inside it start new lines. A log that cannot be opened loses
+    // the line and nothing else: the flash step it records goes on.
     void append(const std::string& line);
 
   private:

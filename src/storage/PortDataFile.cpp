@@ -2,7 +2,8 @@
 
 namespace storage {
 
-PortDataFile portDataFile(const std::string& model, const std::string& receiver) {
+std::optional<PortDataFile> findPortDataFile(const std::string& model,
+                                             const std::string& receiver) {
     PortDataFile file;
     if (receiver.find('R') != std::string::npos) {
         file.fileName = "RcvrCharRef.dat";
@@ -14,12 +15,20 @@ PortDataFile portDataFile(const std::string& model, const std::string& receiver)
         file.portDigit = index == std::string::npos ? '\0' : "1234"[index];
     }
     if (file.portDigit < '1' || file.portDigit > '4') {
-        throw std::string("Receiver \"" + receiver + "\" has no port data file: it is neither " +
-                          "a reference receiver R1 to R4 nor a test receiver A to D");
+        return std::nullopt;
     }
     file.path = "C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\" + model +
                 " Broadband\\Port " + file.portDigit + "\\Factory Cal Data\\" + file.fileName;
     return file;
+}
+
+PortDataFile portDataFile(const std::string& model, const std::string& receiver) {
+    auto file = findPortDataFile(model, receiver);
+    if (!file) {
+        throw std::string("Receiver \"" + receiver + "\" has no port data file: it is neither " +
+                          "a reference receiver R1 to R4 nor a test receiver A to D");
+    }
+    return *file;
 }
 
 }  // namespace storage

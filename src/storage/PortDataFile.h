@@ -3,6 +3,7 @@
 // The per-port data file in which a millimetre-wave system keeps a receiver's
 // characterization, under the analyzer's configuration directory.
 
+#include <optional>
 #include <string>
 
 namespace storage {
@@ -14,8 +15,10 @@ struct PortDataFile {
 };
 
 // A name with "R" in it is a reference receiver whose port digit is its second character;
-// "A" to "D" are the test receivers of ports 1 to 4. Any other name has no port and raises
-// an error text naming it.
+// "A" to "D" are the test receivers of ports 1 to 4. Any other name has no port: nothing.
+std::optional<PortDataFile> findPortDataFile(const std::string& model, const std::string& receiver);
+
+// As findPortDataFile, but a name without a port raises an error text naming it.
 PortDataFile portDataFile(const std::string& model, const std::string& receiver);
 
 }  // namespace storage
