@@ -1,0 +1,48 @@
+#pragma once
+
+// Turns one receiver's measured data into its characterization image: the compression points
+// at 0.05, 0.1, 0.2 and 0.5 dB for every measured frequency, the bad-connection criteria,
+// the raw result file, the operator's choice on bad data, and the store into the analyzer.
+
+#include <filesystem>
+#include <optional>
+#include <string>
+
+#include "platform/OperatorUi.h"
+#include "storage/RcvrCharImage.h"
+#include "storage/StorageContext.h"
+
+namespace engine {
+class CCompressionData;
+}
+
+namespace storage {
+
+struct Judgement {
+    RcvrCharImage image;
+    // Every frequency met the criteria (before any operator choice).
+    bool passed = true;
+    // False when the operator chose to retest: the image is not to be stored.
+    bool accepted = true;
+};
+
+// Steps up to the operator's decision, without an analyzer. mmwave stops the records at the
+// first frequency above the measured range. rawFile, when given, receives the raw result
+// text. Bad data asks ui.badDataChoice: Quit raises "User aborted characterization due to
+// bad data on receiver <name>", Continue shows the "Warning" box and zeroes the measured
+// records. Uses the store's search outputs as working state.
+Judgement judgeResults(engine::CCompressionData& store, const std::string& receiver, bool mmwave,
+                       const std::optional<std::filesystem::path>& rawFile,
+                       platform::OperatorUi& ui);
+
+// The whole step: judges (raw file ".\rcvrCharRaw_<name>.txt" when rawFile is set), stores the
+// accepted image (per-port file on millimetre-wave systems, flash otherwise) and makes the
+// analyzer load it. Returns false when the operator chose to retest (nothing stored).
+// searchMode is not used.
+bool processResults(StorageContext& context, engine::CCompressionData& store,
+                    const std::string& receiver, const std::string& searchMode, bool rawFile);
+
+// ".\rcvrCharRaw_" + name + ".txt", as the file is named in the working directory.
+std::string rawResultFileName(const std::string& receiver);
+
+}  // namespace storage
