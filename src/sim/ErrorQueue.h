@@ -1,0 +1,28 @@
+#pragma once
+
+// The instrument's IEEE 488.2 error queue: first in, first out, bounded; when it is full
+// the newest entry becomes -350,"Queue overflow".
+
+#include <cstddef>
+#include <deque>
+#include <string>
+
+namespace sim {
+
+class ErrorQueue {
+  public:
+    static constexpr std::size_t capacity = 100;
+
+    void push(int code, const std::string& message);
+    // An entry already in the analyzer's form code,"message".
+    void pushText(const std::string& entry);
+    // The oldest entry, or 0,"No error" when empty.
+    std::string pop();
+    void clear() { m_entries.clear(); }
+    std::size_t size() const { return m_entries.size(); }
+
+  private:
+    std::deque<std::string> m_entries;
+};
+
+}  // namespace sim

@@ -1,0 +1,250 @@
+#include <gtest/gtest.h>
+
+#include "SimFixture.h"
+#include "sim/ErrorQueue.h"
+#include "sim/ScpiSyntax.h"
+
+namespace {
+
+using simtest::SimFixture;
+
+TEST(ScpiSyntax, SplitsUnitsOutsideQuotesAndReadsHeaders) {
+    auto units = sim::splitMessageUnits(" *IDN? ; SENS:PATH:CONF:ELEM \"a;b\",\"c\";");
+    ASSERT_EQ(2u, units.size());
+    EXPECT_EQ("*IDN?", units[0]);
+    EXPECT_EQ("SENS:PATH:CONF:ELEM \"a;b\",\"c\"", units[1]);
+
+    auto header = sim::parseHeader(":SENSe1:AVERage:COUNt 5");
+    EXPECT_FALSE(header.query);
+    EXPECT_EQ((std::vector<std::string_view>{"SENSe1", "AVERage", "COUNt"}), header.nodes);
+    EXPECT_EQ(" 5", header.parameters);
+    EXPECT_TRUE(sim::parseHeader("SYST:ERR?").query);
+    EXPECT_THROW(sim::parseHeader("SENS::AVER"), sim::ScpiError);
+}
+
+TEST(ScpiSyntax, ReadsParametersInEverySciForm) {
+    sim::ParameterReader r(R"( +1.5E+3 , 2GHz, 'it''s', ON, 0, nbf , -30 dBm)");
+    EXPECT_DOUBLE_EQ(1500.0, r.number());
+    EXPECT_DOUBLE_EQ(2e9, r.number());
+    EXPECT_EQ("it's", r.string());
+    EXPECT_TRUE(r.boolean());
+    EXPECT_FALSE(r.boolean());
+    EXPECT_EQ("NBF", r.word());
+    EXPECT_DOUBLE_EQ(-30.0, r.number());
+    EXPECT_TRUE(r.atEnd());
+    EXPECT_NO_THROW(r.finish());
+
+    auto code = [](const char* text, auto read) {
+        sim::ParameterReader reader(text);
+        try {
+            read(reader);
+        } catch (const sim::ScpiError& e) {
+            return e.code;
+        }
+        return 0;
+    };
+    EXPECT_EQ(-104, code("abc", [](auto& r) { r.number(); }));
+    EXPECT_EQ(-104, code("12", [](auto& r) { r.string(); }));
+    EXPECT_EQ(-151, code("\"open", [](auto& r) { r.string(); }));
+    EXPECT_EQ(-109, code("", [](auto& r) { r.number(); }));
+    EXPECT_EQ(-109, code("1,", [](auto& r) { r.number(), r.number(); }));
+    EXPECT_EQ(-131, code("5 furlongs", [](auto& r) { r.number(); }));
+    EXPECT_EQ(-224, code("maybe", [](auto& r) { r.boolean(); }));
+    EXPECT_EQ(-108, code("1,2", [](auto& r) { r.number(), r.finish(); }));
+}
+
+TEST(ScpiSyntax, FlashWordsAreSixteenBitUnsigned) {
+    sim::ParameterReader r(" 1, 65535,0");
+    std::uint16_t w = 0;
+    std::vector<std::uint16_t> words;
+    while (r.nextWord(w)) {
+        words.push_back(w);
+    }
+    EXPECT_EQ((std::vector<std::uint16_t>{1, 65535, 0}), words);
+    sim::ParameterReader big("65536");
+    EXPECT_THROW(big.nextWord(w), sim::ScpiError);
+    sim::ParameterReader negative("-1");
+    EXPECT_THROW(negative.nextWord(w), sim::ScpiError);
+}
+
+TEST(ErrorQueue, IsFirstInFirstOutAndReportsOverflow) {
+    sim::ErrorQueue q;
+    EXPECT_EQ("0,\"No error\"", q.pop());
+    q.push(-113, "Undefined header");
+    q.pushText("-200,\"Execution error\"");
+    EXPECT_EQ("-113,\"Undefined header\"", q.pop());
+    EXPECT_EQ("-200,\"Execution error\"", q.pop());
+    EXPECT_EQ("0,\"No error\"", q.pop());
+    for (int i = 0; i < 150; ++i) {
+        q.push(-100, "Command error");
+    }
+    EXPECT_EQ(sim::ErrorQueue::capacity, q.size());
+    for (std::size_t i = 0; i + 1 < sim::ErrorQueue::capacity; ++i) {
+        q.pop();
+    }
+    EXPECT_EQ("-350,\"Queue overflow\"", q.pop());
+}
+
+class Scpi : public SimFixture {
+  protected:
+    void SetUp() override { start(R"({"options": "010,080"})"); }
+};
+
+TEST_F(Scpi, IdentityAndStartUpQueries) {
+    EXPECT_EQ("Velquor Technologies,T3872A,MY00000001,A.13.55.06", scpi("*IDN?"));
+    EXPECT_EQ("\"010,080\"", scpi("*opt?"));
+    EXPECT_EQ("\"C:\\Program Files (x86)\\Velquor\\Network Analyzer\"",
+              scpi("SYST:CONF:DIRectory? APPLICATION"));
+    EXPECT_EQ("4", scpi("diag:portcount?"));
+    EXPECT_EQ("\"Default\"", scpi("SYST:CONF:MWAV:CONF:CAT?"));
+    EXPECT_EQ("0,\"No error\"", nextError());
+}
+
+TEST_F(Scpi, ErrorsAreQueuedInOrderForBadCommands) {
+    EXPECT_EQ("", scpi("BOGUS:COMMAND 1"));
+    scpi("SENS:AVER:COUN abc");
+    scpi("CALC:FUNCTION:TYPE WIDTH");
+    scpi("SENS:AVER:COUN 5,6");
+    scpi("*IDN");  // the command form of a query-only header
+    EXPECT_EQ("-113,\"Undefined header\"", nextError());
+    EXPECT_EQ("-104,\"Data type error; number expected, got \"abc\"\"", nextError());
+    EXPECT_EQ("-224,\"Illegal parameter value; statistic WIDTH\"", nextError());
+    EXPECT_EQ("-108,\"Parameter not allowed\"", nextError());
+    EXPECT_EQ("-113,\"Undefined header\"", nextError());
+    EXPECT_EQ("0,\"No error\"", nextError());
+}
+
+TEST_F(Scpi, KeywordsMatchInShortAndLongFormAnyCase) {
+    scpi("SENSe:PATH:CONFig:ELEMent:STATe \"Port1RefMxr\",\"External\"");
+    EXPECT_EQ("\"EXTERNAL\"", scpi("sens:path:conf:elem? \"PORT1REFMXR\""));
+    scpi("sense1:average:count 7");
+    EXPECT_EQ("7", scpi("SENS:AVER:COUN?"));
+    scpi("SOUR:POW -25,\"PORT 2\"");
+    EXPECT_EQ("-2.50000000000E+01", scpi("SOURce:POWer? \"Port 2\""));
+    EXPECT_EQ("-1.00000000000E+01", scpi("SOUR:POW? \"PORT 1\""));
+    scpi("SOUR:POW 40,\"PORT 1\"");
+    scpi("SOUR:POW -20,\"PORT 9\"");
+    EXPECT_EQ("-222,\"Data out of range; source power -90 to 20 dBm\"", nextError());
+    EXPECT_EQ("-222,\"Data out of range; port 9\"", nextError());
+    EXPECT_EQ("0,\"No error\"", nextError());
+}
+
+TEST_F(Scpi, CompoundMessagesRunEachUnitAndJoinReplies) {
+    EXPECT_EQ("4;\"010,080\"", scpi("diag:portcount?;*OPT?"));
+}
+
+TEST_F(Scpi, NarrowbandAttenuatorAndPathElements) {
+    EXPECT_EQ("\"30\"", scpi("SENS:PATH:CONF:ELEM? \"NBFATNR1\""));
+    EXPECT_EQ("\"30\"", scpi("SENS:PATH:CONF:ELEM? \"NBFATNC\""));
+    EXPECT_EQ("\"WBF\"", scpi("SENS:PATH:CONF:ELEM? \"IFSIGPATHALL\""));
+    scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"NBF\"");
+    EXPECT_EQ("\"NBF\"", scpi("SENS:PATH:CONF:ELEM? \"IFSIGPATHALL\""));
+    scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"XYZ\"");
+    EXPECT_EQ("", scpi("SENS:PATH:CONF:ELEM? \"NBFATNE\""));
+    EXPECT_EQ("-224,\"Illegal parameter value; IF path XYZ\"", nextError());
+    EXPECT_EQ("-224,\"Illegal parameter value; no path element \"NBFATNE\"\"", nextError());
+}
+
+TEST_F(Scpi, EngineSetUpCommandsAreAccepted) {
+    for (const char* command : {"DIAG:RXCAL:STATE OFF",
+                                "CALC:PAR:DEL:ALL",
+                                "CALC:PAR:DEF:EXT \"measmag\",\"R1,1\"",
+                                "DISP:WIND:TRACE1:FEED \"measmag\"",
+                                "SENS:SWE:LFEX:STAT ON",
+                                "SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"WBF\"",
+                                "DIAG:RXCAL:STATE ON",
+                                "DIAG:CMPCAL:STATE ON",
+                                "DIAG:MXCAL:STATE OFF",
+                                "DIAG:SWEEP_PARM \"SweepParm\",\"TRUE\"",
+                                "CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"",
+                                "DISP:WIND:TRACE2:FEED \"measratio\"",
+                                "SENS:AVER:STAT ON",
+                                "SENS:AVER:CLE",
+                                "SENS:AVER:COUN 5",
+                                "CALC:PAR:SEL \"measmag\"",
+                                "CALC:FUNCTION:STAT ON",
+                                "DISP:WIND:TRACE1:SEL",
+                                "DISP:WIND:TRACE1:STAT ON",
+                                "DISP:WIND:TRACE2:SEL",
+                                "display:window:trace2:y:pdivision 0.1",
+                                "format:data ASC",
+                                "calculate:function:type MEAN",
+                                "DIAG:POKE 9,4",
+                                "DIAG:POKE 9,3",
+                                "DIAG:EEUPDATEHW",
+                                "diag:poke:long 9,3",
+                                "diag:eeupdatehw",
+                                "diag:fcal:load",
+                                "diag:mm:data:push 1,0",
+                                "SENSe:PATH:CONF:ELEMent:STATe \"Port1RefMxr\",\"External\""}) {
+        SCOPED_TRACE(command);
+        EXPECT_EQ("", scpi(command));
+        EXPECT_EQ("0,\"No error\"", nextError());
+    }
+    EXPECT_EQ("1", scpi("SENS:SWE:LFEX:STAT?"));
+    EXPECT_EQ("+1.00000000000E-01", scpi("DISP:WIND:TRACE2:Y:PDIV?"));
+    EXPECT_EQ("\"measratio\"", scpi("CALC:PAR:SEL?"));
+}
+
+TEST_F(Scpi, MeasurementDefinitionsAreChecked) {
+    scpi("CALC:PAR:DEF:EXT \"m\",\"E,1\"");
+    scpi("CALC:PAR:DEF:EXT \"m\",\"A/R9,1\"");
+    scpi("CALC:PAR:DEF:EXT \"m\",\"A,PORT 7\"");
+    scpi("CALC:PAR:DEF:EXT \"m\",\"A,PORT 1\"");
+    scpi("CALC:PAR:DEF:EXT \"m\",\"B,PORT 1\"");
+    scpi("CALC:PAR:DEL \"nothing\"");
+    scpi("DISP:WIND:TRACE3:SEL");
+    EXPECT_EQ("-224,\"Illegal parameter value; unknown parameter \"E,1\"\"", nextError());
+    EXPECT_EQ("-224,\"Illegal parameter value; unknown parameter \"A/R9,1\"\"", nextError());
+    EXPECT_EQ("-224,\"Illegal parameter value; unknown parameter \"A,PORT 7\"\"", nextError());
+    EXPECT_EQ("-200,\"Execution error; measurement \"m\" exists\"", nextError());
+    EXPECT_EQ("-224,\"Illegal parameter value; no measurement named \"nothing\"\"", nextError());
+    EXPECT_EQ("-221,\"Settings conflict; trace 3 shows no measurement\"", nextError());
+    EXPECT_EQ("0,\"No error\"", nextError());
+    EXPECT_EQ("\"CH1_S11_1,S11,m,A,PORT 1\"", scpi("CALC:PAR:CAT?"));
+}
+
+TEST_F(Scpi, ScenarioErrorRulesFireAfterMatchingCommandsOnly) {
+    testsupport::TempDir other;
+    sim::SimulatedAnalyzer analyzer(
+        sim::Scenario::fromJson(R"({"faults": {"scpi_errors": [{"command": "DIAG:FCAL",
+            "errors": ["-200,\"Execution error\"", "-310,\"System error\""], "times": 2}]}})"),
+        other.path());
+    auto app = automation::queryInterface<automation::Application>(analyzer.application());
+    auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+    parser->parse("DIAG:EEUPDATEHW");
+    EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
+    for (int i = 0; i < 3; ++i) {
+        parser->parse("diag:fcal:load");
+    }
+    for (int i = 0; i < 2; ++i) {
+        EXPECT_EQ("-200,\"Execution error\"", parser->parse("SYST:ERR?"));
+        EXPECT_EQ("-310,\"System error\"", parser->parse("SYST:ERR?"));
+    }
+    EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
+}
+
+TEST_F(Scpi, TranscriptRecordsCommandsRepliesErrorsAndCalls) {
+    m_analyzer->clearTranscript();
+    scpi("*IDN?");
+    scpi("NOPE");
+    channel()->setSweepType(3);
+    auto lines = m_analyzer->transcript();
+    ASSERT_EQ(6u, lines.size());
+    EXPECT_EQ("> *IDN?", lines[0]);
+    EXPECT_EQ("< Velquor Technologies,T3872A,MY00000001,A.13.55.06", lines[1]);
+    EXPECT_EQ("> NOPE", lines[2]);
+    EXPECT_EQ("! -113,\"Undefined header\"", lines[3]);
+    EXPECT_EQ("@ Application.activeChannel()", lines[4]);
+    EXPECT_EQ("@ Channel.setSweepType(3)", lines[5]);
+}
+
+TEST_F(Scpi, TraceFileReceivesTheTranscript) {
+    testsupport::TempDir dir;
+    m_analyzer->setTraceFile(dir / "trace.txt");
+    scpi("diag:portcount?");
+    EXPECT_EQ("> diag:portcount?\n< 4\n", testsupport::readFile(dir / "trace.txt"));
+    EXPECT_THROW(m_analyzer->setTraceFile(dir / "no" / "such" / "dir.txt"), std::string);
+}
+
+}  // namespace
