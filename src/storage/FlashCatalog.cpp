@@ -4,6 +4,7 @@
 #include <filesystem>
 #include <fstream>
 
+#include "config/Split.h"
 #include "storage/CatalogAge.h"
 #include "storage/PortDataFile.h"
 #include "storage/ReceiverNames.h"
@@ -15,33 +16,10 @@ constexpr char kGrouping = '&';
 constexpr std::size_t kLongestListingLine = 149;
 constexpr const char* kListingFile = "fileInfo.txt";
 
-// Tokens between runs of the delimiter; a token that starts with the grouping character runs
-// to the next one (both left out), and one without a closing partner is dropped.
+// The catalog reply and the listing lines are cut with "&" as the grouping character.
 std::vector<std::string> splitTokens(const std::string& text, char delimiter) {
     std::vector<std::string> tokens;
-    std::size_t pos = 0;
-    while (pos < text.size()) {
-        if (text[pos] == delimiter) {
-            ++pos;
-            continue;
-        }
-        if (text[pos] == kGrouping) {
-            std::size_t close = text.find(kGrouping, pos + 1);
-            if (close == std::string::npos) {
-                ++pos;
-                continue;
-            }
-            tokens.push_back(text.substr(pos + 1, close - pos - 1));
-            pos = close + 1;
-            continue;
-        }
-        std::size_t end = text.find(delimiter, pos);
-        if (end == std::string::npos) {
-            end = text.size();
-        }
-        tokens.push_back(text.substr(pos, end - pos));
-        pos = end;
-    }
+    Split(text, tokens, std::string(1, delimiter), kGrouping);
     return tokens;
 }
 
@@ -59,9 +37,29 @@ const std::string* matchReceiver(const std::string& calibration,
     return match;
 }
 
-void readFlashCatalog(const StorageContext& context, const std::vector<std::string>& receivers,
-                      CatalogFindings& findings, std::chrono::system_clock::time_point now) {
-    for (const auto& line : splitTokens(context.analyzer.flashcatalog(), '\n')) {
+// The listing line that names the file: reading stops there, at the end, or at an overlong
+// line.
+std::string listingLineFor(std::istream& listing, const std::string& fileName) {
+    std::string line;
+    while (std::getline(listing, line)) {
+        if (!line.empty() && line.back() == '\r') {
+            line.pop_back();
+        }
+        if (line.size() > kLongestListingLine) {
+            break;
+        }
+        if (line.find(fileName) != std::string::npos) {
+            return line;
+        }
+    }
+    return {};
+}
+
+}  // namespace
+
+void applyCatalogReply(const std::string& reply, const std::vector<std::string>& receivers,
+                       CatalogFindings& findings, std::chrono::system_clock::time_point now) {
+    for (const auto& line : splitTokens(reply, '\n')) {
         auto fields = splitTokens(line, ' ');
         if (fields.size() < 4 || fields[3].find("RCVRCHAR") == std::string::npos) {
             continue;
@@ -79,52 +77,14 @@ void readFlashCatalog(const StorageContext& context, const std::vector<std::stri
     }
 }
 
-// The listing line that names the file: reading stops there, at the end, or at an overlong
-// line.
-std::string listingLineFor(const std::filesystem::path& listing, const std::string& fileName) {
-    std::ifstream in(listing, std::ios::binary);
-    std::string line;
-    while (std::getline(in, line)) {
-        if (!line.empty() && line.back() == '\r') {
-            line.pop_back();
-        }
-        if (line.size() > kLongestListingLine) {
-            break;
-        }
-        if (line.find(fileName) != std::string::npos) {
-            return line;
-        }
+int listingState(std::istream& listing, const std::string& fileName,
+                 std::chrono::system_clock::time_point now) {
+    auto fields = splitTokens(listingLineFor(listing, fileName), ' ');
+    if (fields.size() < 4 || std::strtod(fields[3].c_str(), nullptr) == 0) {
+        return kCatalogNothing;
     }
-    return {};
+    return catalogAge(fields[0], now);
 }
-
-void readDataFileListings(const StorageContext& context, platform::ProcessRunner& processes,
-                          const std::vector<std::string>& receivers, CatalogFindings& findings,
-                          std::chrono::system_clock::time_point now) {
-    const std::string model = context.analyzer.readmodel(false);
-    const auto listing = context.paths.toLocal(kListingFile);
-    for (const auto& receiver : receivers) {
-        auto file = findPortDataFile(model, receiver);
-        if (!file) {
-            continue;
-        }
-        // A listing left from the previous receiver must not stand in for this one's.
-        std::error_code ignored;
-        std::filesystem::remove(listing, ignored);
-        processes.runCommand("dir /-C \"" + file->path + "\" > " + kListingFile);
-        auto fields = splitTokens(listingLineFor(listing, file->fileName), ' ');
-        if (fields.empty()) {
-            continue;
-        }
-        int state = catalogAge(fields[0], now);
-        if (state != kCatalogNothing && fields.size() >= 4 &&
-            std::strtod(fields[3].c_str(), nullptr) != 0) {
-            findings[receiver] = state;
-        }
-    }
-}
-
-}  // namespace
 
 void catalogFlash(const StorageContext& context, platform::ProcessRunner& processes,
                   const std::vector<std::string>& receivers, CatalogFindings& findings,
@@ -132,10 +92,25 @@ void catalogFlash(const StorageContext& context, platform::ProcessRunner& proces
     for (const auto& receiver : receivers) {
         findings.emplace(receiver, kCatalogNothing);
     }
-    if (context.analyzer.ismmwave()) {
-        readDataFileListings(context, processes, receivers, findings, now);
-    } else {
-        readFlashCatalog(context, receivers, findings, now);
+    if (!context.analyzer.ismmwave()) {
+        applyCatalogReply(context.analyzer.flashcatalog(), receivers, findings, now);
+        return;
+    }
+    const std::string model = context.analyzer.readmodel(false);
+    const auto listingPath = context.paths.toLocal(kListingFile);
+    for (const auto& receiver : receivers) {
+        auto file = findPortDataFile(model, receiver);
+        if (!file) {
+            continue;
+        }
+        // A listing left from the previous receiver must not stand in for this one's.
+        std::error_code ignored;
+        std::filesystem::remove(listingPath, ignored);
+        processes.runCommand("dir /-C \"" + file->path + "\" > " + kListingFile);
+        std::ifstream listing(listingPath, std::ios::binary);
+        if (int state = listingState(listing, file->fileName, now); state != kCatalogNothing) {
+            findings[receiver] = state;
+        }
     }
 }
 

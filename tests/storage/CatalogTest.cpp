@@ -1,0 +1,147 @@
+#include <gtest/gtest.h>
+
+#include <ctime>
+#include <sstream>
+
+#include "SimBench.h"
+#include "storage/CatalogAge.h"
+#include "storage/FlashCatalog.h"
+
+using namespace std::chrono;
+using storage::catalogAge;
+using storage::CatalogFindings;
+
+namespace {
+
+// A moment given in local wall-clock time (the tests run in Europe/Kyiv).
+system_clock::time_point localTime(int year, int month, int day, int hour, int minute,
+                                   int second = 0) {
+    std::tm tm{};
+    tm.tm_year = year - 1900;
+    tm.tm_mon = month - 1;
+    tm.tm_mday = day;
+    tm.tm_hour = hour;
+    tm.tm_min = minute;
+    tm.tm_sec = second;
+    tm.tm_isdst = -1;
+    return system_clock::from_time_t(std::mktime(&tm));
+}
+
+// A flash-based analyzer starts no processes.
+struct NoProcesses : platform::ProcessRunner {
+    int runProgram(const std::string& commandLine) override {
+        ADD_FAILURE() << "program started: " << commandLine;
+        return 1;
+    }
+    int runCommand(const std::string& command) override {
+        ADD_FAILURE() << "command run: " << command;
+        return 1;
+    }
+};
+
+const std::vector<std::string> kReceivers = {"R1", "R2", "A", "B", "R1 LOW FREQUENCY EXTENSION"};
+
+}  // namespace
+
+TEST(CatalogAge, SevenWholeDaysCountFromNoonOfTheDate) {
+    auto beforeNoon = localTime(2026, 3, 10, 11, 59, 59);
+    auto atNoon = localTime(2026, 3, 10, 12, 0, 0);
+    EXPECT_EQ(catalogAge("3/10/2026", beforeNoon), 1);
+    EXPECT_EQ(catalogAge("3/2/2026", beforeNoon), 1);  // 7 days 23 hours
+    EXPECT_EQ(catalogAge("3/2/2026", atNoon), -1);     // 8 days
+    EXPECT_EQ(catalogAge("3/3/2026", localTime(2026, 3, 10, 23, 59, 59)), 1);
+    EXPECT_EQ(catalogAge("03/02/2026", atNoon), -1);
+    EXPECT_EQ(catalogAge("12/4/2025", atNoon), -1);
+    EXPECT_EQ(catalogAge("3/20/2026", atNoon), 1);  // in the future
+    // Half a second before noon rounds to noon: 8 whole days.
+    EXPECT_EQ(catalogAge("3/2/2026", atNoon - milliseconds(500)), -1);
+    EXPECT_EQ(catalogAge("3/2/2026", atNoon - milliseconds(501)), 1);
+}
+
+TEST(CatalogAge, DifferencesAreLocalWallClockAcrossDaylightSaving) {
+    // Summer time starts on 29 March 2026 in Kyiv; eight calendar days at noon are still
+    // eight days although only 191 hours passed.
+    EXPECT_EQ(catalogAge("3/25/2026", localTime(2026, 4, 2, 12, 0, 0)), -1);
+    EXPECT_EQ(catalogAge("3/25/2026", localTime(2026, 4, 2, 11, 59, 59)), 1);
+}
+
+TEST(CatalogAge, UnreadableDatesAreUndetermined) {
+    auto now = localTime(2026, 3, 10, 12, 0);
+    EXPECT_EQ(catalogAge("12/0/2026", now), 0);
+    EXPECT_EQ(catalogAge("13/1/2026", now), 0);  // day first: no month above 12
+    EXPECT_EQ(catalogAge("0/5/2026", now), 0);
+    EXPECT_EQ(catalogAge("2/30/2026", now), 0);
+    EXPECT_EQ(catalogAge("3/345/2026", now), 0);  // the day is read from two characters
+    EXPECT_EQ(catalogAge("3/10", now), 0);
+    EXPECT_EQ(catalogAge("Volume", now), 0);
+    EXPECT_EQ(catalogAge("", now), 0);
+}
+
+TEST(CatalogReply, FindsReceiversByCalibrationNameAndAge) {
+    auto now = localTime(2026, 3, 10, 9, 30);
+    CatalogFindings findings{
+        {"R1", 0}, {"R2", 0}, {"A", 2}, {"B", 0}, {"R1 LOW FREQUENCY EXTENSION", 0}};
+    storage::applyCatalogReply(
+        "03/10/2026 08:00:00 5622 RCVRCHAR\\R1_LFE\n"  // R1 and R1_LFE match; the later wins
+        "02/01/2026 08:00:00 5622 RCVRCHAR\\R2\n"
+        "03/09/2026 08:00:00 5622 RCVRCHAR\\R2\n"  // later lines overwrite
+        "12/0/2026 08:00:00 5622 RCVRCHAR\\A\n"    // unreadable date: unchanged
+        "03/10/2026 08:00:00 5622 RcvrChar\\B\n"   // other capitalisation: ignored
+        "03/10/2026 5622 RCVRCHAR\\B\n"            // three fields: no characterization
+        "03/10/2026 08:00:00 5622 OTHER\\B\n",
+        kReceivers, findings, now);
+    EXPECT_EQ(findings,
+              (CatalogFindings{
+                  {"R1", 0}, {"R2", 1}, {"A", 2}, {"B", 0}, {"R1 LOW FREQUENCY EXTENSION", 1}}));
+}
+
+TEST(CatalogReply, EightDaysOldDependsOnTheHourAndEmptyRepliesChangeNothing) {
+    std::string reply = "03/02/2026 00:00:01 58 RCVRCHAR\\B\r\n";
+    CatalogFindings morning;
+    storage::applyCatalogReply(reply, kReceivers, morning, localTime(2026, 3, 10, 11, 0));
+    EXPECT_EQ(morning["B"], 1);
+    CatalogFindings afternoon;
+    storage::applyCatalogReply(reply, kReceivers, afternoon, localTime(2026, 3, 10, 12, 0));
+    EXPECT_EQ(afternoon["B"], -1);
+    CatalogFindings untouched{{"B", 3}};
+    storage::applyCatalogReply("", kReceivers, untouched, localTime(2026, 3, 10, 12, 0));
+    storage::applyCatalogReply("\n\n  \n", kReceivers, untouched, localTime(2026, 3, 10, 12, 0));
+    EXPECT_EQ(untouched, (CatalogFindings{{"B", 3}}));
+}
+
+TEST(CatalogListing, ReadsDateFirstAndSizeFourthOfTheFilesLine) {
+    auto now = localTime(2026, 3, 10, 9, 0);
+    auto state = [&](const std::string& listing, const std::string& file = "RcvrCharRef.dat") {
+        std::istringstream in(listing);
+        return storage::listingState(in, file, now);
+    };
+    std::string head =
+        " Volume in drive C has no label.\r\n Volume Serial Number is 1C2D-3E4F\r\n\r\n"
+        " Directory of C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\T3951A "
+        "Broadband\\Port 1\\Factory Cal Data\r\n\r\n";
+    EXPECT_EQ(state(head + "03/09/2026  10:15 AM              5622 RcvrCharRef.dat\r\n"), 1);
+    EXPECT_EQ(state(head + "02/09/2026  10:15 AM              5622 RcvrCharRef.dat\r\n"), -1);
+    EXPECT_EQ(state(head + "03/09/2026  10:15 AM                 0 RcvrCharRef.dat\r\n"), 0);
+    EXPECT_EQ(state(head + "File Not Found\r\n"), 0);
+    EXPECT_EQ(state(head + "03/09/2026  10:15 AM  5622 RcvrCharTest.dat\r\n"), 0);
+    EXPECT_EQ(state(head + "03/09/2026  10:15 AM  5622 RcvrCharTest.dat\r\n", "RcvrCharTest.dat"),
+              1);
+    // Reading stops at an overlong line, even when the file's line follows it.
+    EXPECT_EQ(state(std::string(150, 'x') + "\r\n03/09/2026 10:15 AM 5622 RcvrCharRef.dat\r\n"), 0);
+    EXPECT_EQ(state(std::string(149, 'x') + "\r\n03/09/2026 10:15 AM 5622 RcvrCharRef.dat\r\n"), 1);
+    EXPECT_EQ(state(""), 0);
+}
+
+TEST(CatalogFlash, ReadsTheSimulatorsFlashCatalog) {
+    storagetest::SimBench bench(R"("stored": [
+        {"receiver": "R1", "age_days": 1, "records": 3},
+        {"receiver": "R2", "age_days": 30, "records": 3},
+        {"receiver": "B", "age_days": 2, "records": 3}])");
+    CatalogFindings findings{{"B", 2}};
+    NoProcesses processes;
+    storage::catalogFlash(bench.context(), processes, kReceivers, findings);
+    EXPECT_EQ(findings,
+              (CatalogFindings{
+                  {"R1", 1}, {"R2", -1}, {"A", 0}, {"B", 1}, {"R1 LOW FREQUENCY EXTENSION", 0}}));
+    EXPECT_EQ(bench.commands(), std::vector<std::string>{"DIAG:FLASH:CAT?"});
+}

@@ -1,0 +1,228 @@
+#include <gtest/gtest.h>
+#include <sys/resource.h>
+
+#include <csignal>
+#include <functional>
+
+#include "SimBench.h"
+#include "platform/ErrorText.h"
+#include "storage/FlashTransfer.h"
+#include "storage/PortDataFile.h"
+
+using storage::RcvrCharImage;
+using storagetest::SimBench;
+
+namespace {
+
+const std::string kConfigurations = "C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\";
+
+RcvrCharImage imageOf(const std::string& receiver, std::uint32_t records) {
+    auto image = RcvrCharImage::withHeader(receiver, records, -2.5f, 30.0f);
+    for (std::uint32_t i = 0; i < records; ++i) {
+        image.appendRecord(
+            1e9 * (i + 1),
+            {{{-10, -0.05f, -0.1f}, {-9, -0.1f, -0.2f}, {-8, -0.2f, -0.4f}, {-7, -0.5f, -1.0f}}});
+    }
+    return image;
+}
+
+std::string errorOf(const std::function<void()>& action) {
+    try {
+        action();
+    } catch (...) {
+        return platform::currentErrorText();
+    }
+    return "nothing thrown";
+}
+
+// Limits the size of files this process may write, as a full disk would, for one scope.
+class FileSizeLimit {
+  public:
+    explicit FileSizeLimit(rlim_t bytes) {
+        m_oldHandler = std::signal(SIGXFSZ, SIG_IGN);
+        getrlimit(RLIMIT_FSIZE, &m_old);
+        rlimit limit = m_old;
+        limit.rlim_cur = bytes;
+        setrlimit(RLIMIT_FSIZE, &limit);
+    }
+    ~FileSizeLimit() {
+        setrlimit(RLIMIT_FSIZE, &m_old);
+        std::signal(SIGXFSZ, m_oldHandler);
+    }
+
+  private:
+    rlimit m_old{};
+    void (*m_oldHandler)(int);
+};
+
+}  // namespace
+
+TEST(PortDataFile, PathFollowsModelReceiverKindAndPort) {
+    struct Case {
+        const char* receiver;
+        char port;
+        const char* file;
+    };
+    for (const Case& c :
+         {Case{"A", '1', "RcvrCharTest.dat"}, Case{"B", '2', "RcvrCharTest.dat"},
+          Case{"C", '3', "RcvrCharTest.dat"}, Case{"D", '4', "RcvrCharTest.dat"},
+          Case{"R1", '1', "RcvrCharRef.dat"}, Case{"R3", '3', "RcvrCharRef.dat"},
+          Case{"R4", '4', "RcvrCharRef.dat"}, Case{"R2_LFE", '2', "RcvrCharRef.dat"},
+          Case{"R1 LOW FREQUENCY EXTENSION", '1', "RcvrCharRef.dat"}}) {
+        auto file = storage::portDataFile("T3951A", c.receiver);
+        EXPECT_EQ(file.portDigit, c.port) << c.receiver;
+        EXPECT_EQ(file.fileName, c.file) << c.receiver;
+        EXPECT_EQ(file.path, kConfigurations + "T3951A Broadband\\Port " + c.port +
+                                 "\\Factory Cal Data\\" + c.file)
+            << c.receiver;
+    }
+}
+
+TEST(PortDataFile, NamesWithoutAPortAreRefused) {
+    for (const char* name : {"", "E", "AB", "R", "R9", "RX"}) {
+        EXPECT_FALSE(storage::findPortDataFile("T3951A", name)) << name;
+    }
+    EXPECT_EQ(errorOf([] { storage::portDataFile("T3951A", "E"); }),
+              "Receiver \"E\" has no port data file: it is neither a reference receiver R1 to R4 "
+              "nor a test receiver A to D");
+}
+
+TEST(PushPortFile, WritesTheImageAndPushesItsPort) {
+    SimBench bench(storagetest::kMillimetreWave);
+    ASSERT_TRUE(bench.analyzer->ismmwave());
+    auto path = kConfigurations + "T3951A Broadband\\Port 2\\Factory Cal Data\\RcvrCharTest.dat";
+    testsupport::writeFile(bench.local(path), std::string(9000, 'x'));  // replaced whole
+    auto image = imageOf("B", 3);
+    auto waitedBefore = bench.clock.totalWaited();
+
+    storage::pushPortFile(bench.context(), "B", image);
+
+    std::string bytes = testsupport::readFile(bench.local(path));
+    EXPECT_EQ(bytes.size(), 22u + 56u * 3u);
+    EXPECT_EQ(bytes, image.bytes());
+    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
+    EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 2,0"});
+    EXPECT_EQ(bench.logLines(),
+              (std::vector<std::string>{"Initialized file", "diag:mm:data:push 2,0"}));
+    EXPECT_TRUE(bench.ui.boxes().empty());
+    EXPECT_EQ(bench.clock.totalWaited() - waitedBefore, std::chrono::milliseconds(2000 + 50 * 2));
+    // The analyzer took the file into flash.
+    EXPECT_EQ(RcvrCharImage::fromFlashReply(
+                  bench.analyzer->sendscpi("DIAG:flasharray? \"RCVRCHAR\",\"B\"")),
+              image);
+}
+
+TEST(PushPortFile, ReferenceReceiverGoesToItsPortsRefFile) {
+    SimBench bench(storagetest::kMillimetreWave);
+    storage::pushPortFile(bench.context(), "R3", imageOf("R3", 1));
+    EXPECT_TRUE(std::filesystem::exists(bench.local(
+        kConfigurations + "T3951A Broadband\\Port 3\\Factory Cal Data\\RcvrCharRef.dat")));
+    EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 3,0"});
+}
+
+TEST(PushPortFile, TwoAnalyzerErrorsShowInOneBoxAndInTheLog) {
+    SimBench bench(std::string(storagetest::kMillimetreWave) + R"(, "faults": {"scpi_errors": [
+        {"command": "diag:mm:data:push", "errors": ["-200,\"Execution error\"",
+                                                    "-222,\"Data out of range\""]}]})");
+    bench.ui.answer("SCPI Error Writing Flash", {platform::Answer::Ok});
+    storage::pushPortFile(bench.context(), "A", imageOf("A", 2));
+    auto boxes = bench.ui.boxes();
+    ASSERT_EQ(boxes.size(), 1u);
+    EXPECT_EQ(boxes[0].box.caption, "SCPI Error Writing Flash");
+    EXPECT_EQ(boxes[0].box.text, ",\"Execution error\"\n,\"Data out of range\"");
+    EXPECT_EQ(boxes[0].box.buttons, platform::Buttons::Ok);
+    EXPECT_EQ(boxes[0].box.flags, platform::BoxSystemModal);
+    EXPECT_EQ(bench.logLines(),
+              (std::vector<std::string>{"Initialized file", "diag:mm:data:push 1,0",
+                                        ",\"Execution error\"", ",\"Data out of range\""}));
+}
+
+TEST(PushPortFile, MissingFolderRaisesAndSendsNoPush) {
+    SimBench bench(storagetest::kMillimetreWave);
+    auto folder = kConfigurations + "T3951A Broadband\\Port 4\\Factory Cal Data";
+    std::filesystem::remove_all(bench.local(folder));
+    auto text = errorOf([&] { storage::pushPortFile(bench.context(), "D", imageOf("D", 1)); });
+    EXPECT_EQ(text, "Cannot write the characterization data file " + folder +
+                        "\\RcvrCharTest.dat (" +
+                        bench.local(folder + "\\RcvrCharTest.dat").string() +
+                        "): No such file or directory");
+    EXPECT_TRUE(bench.commands().empty());
+    EXPECT_EQ(bench.logLines(), std::vector<std::string>{"Initialized file"});
+}
+
+TEST(PushPortFile, FullDiskKeepsTheOldFileWholeAndSendsNoPush) {
+    SimBench bench(storagetest::kMillimetreWave);
+    auto path = kConfigurations + "T3951A Broadband\\Port 1\\Factory Cal Data\\RcvrCharRef.dat";
+    auto old = imageOf("R1", 1).bytes();
+    testsupport::writeFile(bench.local(path), old);
+    std::string text;
+    {
+        FileSizeLimit limit(200);
+        text = errorOf([&] { storage::pushPortFile(bench.context(), "R1", imageOf("R1", 10)); });
+    }
+    EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
+                        bench.local(path).string() + "): File too large");
+    EXPECT_EQ(testsupport::readFile(bench.local(path)), old);
+    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
+    EXPECT_TRUE(bench.commands().empty());
+}
+
+TEST(PushPortFile, TargetThatCannotBeReplacedRaisesWithTheReason) {
+    SimBench bench(storagetest::kMillimetreWave);
+    auto path = kConfigurations + "T3951A Broadband\\Port 2\\Factory Cal Data\\RcvrCharRef.dat";
+    std::filesystem::create_directories(bench.local(path) / "occupied");
+    auto text = errorOf([&] { storage::pushPortFile(bench.context(), "R2", imageOf("R2", 1)); });
+    EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
+                        bench.local(path).string() + "): Is a directory");
+    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
+    EXPECT_TRUE(bench.commands().empty());
+}
+
+TEST(ReloadFromFlash, SendsLoadAndPushAndLogsBoth) {
+    SimBench bench;
+    auto waitedBefore = bench.clock.totalWaited();
+    bool needsPreparation = false;
+    EXPECT_TRUE(storage::reloadFromFlash(bench.context(), needsPreparation));
+    EXPECT_TRUE(needsPreparation);
+    EXPECT_EQ(bench.commands(),
+              (std::vector<std::string>{"diag:fcal:load", "diag:mm:data:push 1,0"}));
+    EXPECT_EQ(bench.logLines(),
+              (std::vector<std::string>{"Initialized file", "diag:fcal:load",
+                                        "After diag fcal load  ", "diag:mm:data:push 1,0"}));
+    EXPECT_TRUE(bench.ui.boxes().empty());
+    EXPECT_EQ(bench.clock.totalWaited() - waitedBefore, std::chrono::milliseconds(1000 + 50 * 4));
+}
+
+TEST(ReloadFromFlash, ErrorsOfEachStepGetTheirOwnCaptionAndTheFlagIsStillSet) {
+    SimBench bench(std::string(storagetest::kMillimetreWave) + R"(, "faults": {"scpi_errors": [
+        {"command": "diag:fcal:load", "errors": ["-100,\"Command error\""]},
+        {"command": "diag:mm:data:push", "errors": ["-200,\"Execution error\""]}]})");
+    bench.ui.answerAll(platform::Answer::Ok);
+    bool needsPreparation = false;
+    EXPECT_TRUE(storage::reloadFromFlash(bench.context(), needsPreparation));
+    EXPECT_TRUE(needsPreparation);
+    EXPECT_EQ(bench.ui.captions(), (std::vector<std::string>{"SCPI Error loading from flash",
+                                                             "SCPI Error Writing Flash"}));
+    EXPECT_EQ(bench.logLines(),
+              (std::vector<std::string>{"Initialized file", "diag:fcal:load", ",\"Command error\"",
+                                        "After diag fcal load  ", "diag:mm:data:push 1,0",
+                                        ",\"Execution error\""}));
+}
+
+TEST(FlashCommandLog, CreateStartsAfreshAndFailsLoudlyWithoutAFolder) {
+    testsupport::TempDir dir;
+    platform::DrivePathMap paths(dir.path());
+    storage::FlashCommandLog log(paths);
+    testsupport::writeFile(dir / "FlashCommands.txt", "stale\r\n");
+    log.create();
+    log.append("one\ntwo");
+    EXPECT_EQ(testsupport::readFile(dir / "FlashCommands.txt"),
+              "Initialized file\r\none\r\ntwo\r\n");
+
+    platform::DrivePathMap missing(dir / "absent");
+    storage::FlashCommandLog nowhere(missing);
+    EXPECT_EQ(errorOf([&] { nowhere.create(); }),
+              "Cannot create the flash command log .\\FlashCommands.txt (" +
+                  (dir / "absent" / "FlashCommands.txt").string() + "): No such file or directory");
+    EXPECT_NO_THROW(nowhere.append("lost"));
+}

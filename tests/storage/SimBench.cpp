@@ -1,0 +1,47 @@
+#include "SimBench.h"
+
+#include <gtest/gtest.h>
+
+namespace storagetest {
+
+SimBench::SimBench(const std::string& scenarioMembers)
+    : simulator(std::make_unique<sim::SimulatedAnalyzer>(
+          sim::Scenario::fromJson("{" + scenarioMembers + "}"), dir / "analyzer")),
+      paths(dir / "work"),
+      log(paths) {
+    std::filesystem::create_directories(workDir());
+    paths.mapDrive('C', simulator->driveRoot());
+    simulator->registerAsBackend();
+    analyzer = std::make_unique<CNetworkAnalyzer>("", ui, clock);
+    analyzer->readmodel(true);
+    log.create();
+    simulator->clearTranscript();
+}
+
+std::vector<std::string> SimBench::commands() const {
+    std::vector<std::string> sent;
+    for (const auto& line : simulator->transcript()) {
+        if (line.rfind("> ", 0) == 0 && line != "> SYST:ERR?") {
+            sent.push_back(line.substr(2));
+        }
+    }
+    return sent;
+}
+
+std::vector<std::string> SimBench::logLines() const {
+    std::string text = testsupport::readFile(workDir() / "FlashCommands.txt");
+    std::vector<std::string> lines;
+    std::size_t pos = 0;
+    while (pos < text.size()) {
+        std::size_t end = text.find("\r\n", pos);
+        if (end == std::string::npos) {
+            ADD_FAILURE() << "log line without CR LF: " << text.substr(pos);
+            break;
+        }
+        lines.push_back(text.substr(pos, end - pos));
+        pos = end + 2;
+    }
+    return lines;
+}
+
+}  // namespace storagetest

@@ -1,0 +1,54 @@
+#pragma once
+
+// A simulated analyzer, its proxy and everything a storage operation needs, in a fresh
+// temporary directory: the analyzer's C: drive and a working directory.
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "TempDir.h"
+#include "analyzer/NetworkAnalyzerClass.h"
+#include "platform/Clock.h"
+#include "platform/PathMap.h"
+#include "platform/ScriptedOperatorUi.h"
+#include "sim/SimulatedAnalyzer.h"
+#include "storage/FlashCommandLog.h"
+#include "storage/StorageContext.h"
+
+namespace storagetest {
+
+// A T3872B whose active configuration is the T3951A broadband system.
+inline constexpr const char* kMillimetreWave =
+    R"("idn": "Velquor Technologies,T3872B,MY00000001,A.13.55.06",
+       "mmwave_catalog": "Default,T3951A Broadband", "mmwave_active": "T3951A Broadband")";
+
+class SimBench {
+  public:
+    // scenarioMembers: the members of the scenario's JSON object, without braces.
+    explicit SimBench(const std::string& scenarioMembers = "");
+
+    storage::StorageContext context() { return {*analyzer, ui, clock, paths, log}; }
+    std::filesystem::path workDir() const { return dir / "work"; }
+    std::filesystem::path drive() const { return simulator->driveRoot(); }
+    // The local file of a Windows path on the analyzer's computer.
+    std::filesystem::path local(const std::string& windowsPath) const {
+        return paths.toLocal(windowsPath);
+    }
+
+    // SCPI commands sent since the last clear, without the error-queue reads.
+    std::vector<std::string> commands() const;
+    void clearTranscript() { simulator->clearTranscript(); }
+    // The lines of FlashCommands.txt, which must all end in CR LF.
+    std::vector<std::string> logLines() const;
+
+    testsupport::TempDir dir;
+    std::unique_ptr<sim::SimulatedAnalyzer> simulator;
+    platform::ScriptedOperatorUi ui;
+    platform::VirtualClock clock;
+    platform::DrivePathMap paths;
+    storage::FlashCommandLog log;
+    std::unique_ptr<CNetworkAnalyzer> analyzer;
+};
+
+}  // namespace storagetest
