@@ -1,0 +1,118 @@
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+
+#include "TempDir.h"
+#include "config/T3872Acomcal.h"
+
+namespace {
+
+// Reads text as the dialog does. Only the two error kinds of the system may escape; any other
+// exception (out of range, bad allocation) or a crash under the sanitizers is a fault.
+void readOrFailCleanly(const testsupport::TempDir& dir, const std::string& text,
+                       const std::string& label) {
+    auto path = dir / "RcvrChar.dat";
+    testsupport::writeFile(path, text);
+    CT3872Acomcal config;
+    config.SetModel("T3872A");
+    config.SetOptions({"010", "080"});
+    try {
+        config.ReadSequence(path.string());
+    } catch (const std::string& error) {
+        EXPECT_FALSE(error.empty()) << label;
+    } catch (const char* error) {
+        EXPECT_NE(error, nullptr) << label;
+    } catch (const std::exception& e) {
+        ADD_FAILURE() << label << ": unexpected " << e.what();
+    }
+}
+
+std::vector<std::string> lines(const std::string& text) {
+    std::vector<std::string> out;
+    std::size_t start = 0;
+    for (std::size_t end = text.find('\n'); end != std::string::npos;
+         end = text.find('\n', start)) {
+        out.push_back(text.substr(start, end - start + 1));
+        start = end + 1;
+    }
+    return out;
+}
+
+class ReaderRobustness : public ::testing::Test {
+  protected:
+    std::string m_sample = testsupport::readFile(testsupport::sampleConfiguration());
+    testsupport::TempDir m_dir;
+    std::mt19937 m_random{20240611};
+};
+
+TEST_F(ReaderRobustness, SampleReadsCleanly) {
+    ASSERT_GT(m_sample.size(), 1000U);
+    CT3872Acomcal config;
+    config.SetModel("T3872A");
+    config.SetOptions({"010", "080"});
+    EXPECT_NO_THROW(config.ReadSequence(testsupport::sampleConfiguration().string()));
+}
+
+TEST_F(ReaderRobustness, TruncatedFiles) {
+    for (int i = 0; i < 150; ++i) {
+        std::size_t cut = m_random() % m_sample.size();
+        readOrFailCleanly(m_dir, m_sample.substr(0, cut), "cut at " + std::to_string(cut));
+    }
+}
+
+TEST_F(ReaderRobustness, ShuffledAndDroppedLines) {
+    auto all = lines(m_sample);
+    for (int i = 0; i < 60; ++i) {
+        auto shuffled = all;
+        // Shuffle a window so that some structure survives and deeper code is reached.
+        std::size_t from = m_random() % shuffled.size();
+        std::size_t to = std::min(shuffled.size(), from + 2 + m_random() % 12);
+        std::shuffle(shuffled.begin() + static_cast<std::ptrdiff_t>(from),
+                     shuffled.begin() + static_cast<std::ptrdiff_t>(to), m_random);
+        if (i % 2 == 0) {
+            shuffled.erase(shuffled.begin() +
+                           static_cast<std::ptrdiff_t>(m_random() % shuffled.size()));
+        }
+        std::string text;
+        for (const auto& line : shuffled) {
+            text += line;
+        }
+        readOrFailCleanly(m_dir, text, "shuffle " + std::to_string(i));
+    }
+}
+
+TEST_F(ReaderRobustness, MutatedBytes) {
+    const std::string specials = ",\"\n\r &0x-9";
+    for (int i = 0; i < 150; ++i) {
+        std::string text = m_sample;
+        for (int k = 0; k < 1 + i % 8; ++k) {
+            std::size_t at = m_random() % text.size();
+            switch (m_random() % 3) {
+                case 0:
+                    text[at] = specials[m_random() % specials.size()];
+                    break;
+                case 1:
+                    text.erase(at, 1 + m_random() % 20);
+                    break;
+                default:
+                    text.insert(at, 1, static_cast<char>(m_random() % 256));
+            }
+        }
+        readOrFailCleanly(m_dir, text, "mutation " + std::to_string(i));
+    }
+}
+
+TEST_F(ReaderRobustness, RandomText) {
+    const std::string alphabet = "T3872A,\"\n\r x0-9Banded";
+    for (int i = 0; i < 40; ++i) {
+        std::string text = i % 2 ? "T3872\n\nT3872A,Value,a,b,c\n" : "";
+        std::size_t length = m_random() % 3000;
+        for (std::size_t k = 0; k < length; ++k) {
+            text += alphabet[m_random() % alphabet.size()];
+        }
+        readOrFailCleanly(m_dir, text, "random " + std::to_string(i));
+    }
+}
+
+}  // namespace
