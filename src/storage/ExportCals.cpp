@@ -20,10 +20,10 @@ void exportCals(const StorageContext& context, const std::vector<std::string>& r
     }
 }
 
-std::vector<std::string> exportStoredCals(const StorageContext& context,
-                                          const std::vector<std::string>& receivers,
-                                          const CatalogFindings& findings) {
-    std::vector<std::string> written;
+ExportResult exportStoredCals(const StorageContext& context,
+                              const std::vector<std::string>& receivers,
+                              const CatalogFindings& findings) {
+    ExportResult result;
     for (const auto& receiver : receivers) {
         auto state = findings.find(receiver);
         if (state == findings.end() || state->second == kCatalogNothing) {
@@ -31,6 +31,8 @@ std::vector<std::string> exportStoredCals(const StorageContext& context,
         }
         RcvrCharImage image = readStoredImage(context, receiver);
         if (image.completeness() == ImageCompleteness::NoHeader) {
+            result.endedAt = receiver;
+            result.reason = image.defect();
             break;
         }
         std::string name = "RcvrChar_" + flashName(receiver) + "_Exported.txt";
@@ -42,12 +44,14 @@ std::vector<std::string> exportStoredCals(const StorageContext& context,
             throw std::string("Cannot write the export file " + name + " (" + local.string() +
                               "): " + std::strerror(errno));
         }
-        written.push_back(name);
+        result.files.push_back(name);
         if (!complete) {
+            result.endedAt = receiver;
+            result.reason = image.defect();
             break;
         }
     }
-    return written;
+    return result;
 }
 
 }  // namespace storage

@@ -124,9 +124,11 @@ TEST(ExportCals, ImageWithoutHeaderEndsTheExport) {
     // R2 erased since start-up (state 3) finds nothing and ends the export before A.
     SimBench bench(R"("stored": [{"receiver": "R1", "age_days": 1, "records": 1},
                                  {"receiver": "A", "age_days": 1, "records": 1}])");
-    auto written = storage::exportStoredCals(bench.context(), {"R1", "R2", "A"},
-                                             {{"R1", 1}, {"R2", 3}, {"A", 1}});
-    EXPECT_EQ(written, std::vector<std::string>{"RcvrChar_R1_Exported.txt"});
+    auto result = storage::exportStoredCals(bench.context(), {"R1", "R2", "A"},
+                                            {{"R1", 1}, {"R2", 3}, {"A", 1}});
+    EXPECT_EQ(result.files, std::vector<std::string>{"RcvrChar_R1_Exported.txt"});
+    EXPECT_EQ(result.endedAt, "R2");
+    EXPECT_EQ(result.reason, "the image holds 1 words, fewer than the 11 of its header");
     EXPECT_FALSE(std::filesystem::exists(bench.workDir() / "RcvrChar_R2_Exported.txt"));
     EXPECT_FALSE(std::filesystem::exists(bench.workDir() / "RcvrChar_A_Exported.txt"));
 }
@@ -134,8 +136,11 @@ TEST(ExportCals, ImageWithoutHeaderEndsTheExport) {
 TEST(ExportCals, ImageMissingRecordsLeavesHeaderOnlyAndEndsTheExport) {
     SimBench bench(R"("stored": [{"receiver": "R1", "age_days": 1, "words": 94},
                                  {"receiver": "A", "age_days": 1, "records": 1}])");
-    auto written = storage::exportStoredCals(bench.context(), {"R1", "A"}, {{"R1", 1}, {"A", 1}});
-    EXPECT_EQ(written, std::vector<std::string>{"RcvrChar_R1_Exported.txt"});
+    auto result = storage::exportStoredCals(bench.context(), {"R1", "A"}, {{"R1", 1}, {"A", 1}});
+    EXPECT_EQ(result.files, std::vector<std::string>{"RcvrChar_R1_Exported.txt"});
+    EXPECT_EQ(result.endedAt, "R1");
+    EXPECT_EQ(result.reason,
+              "the header announces 3 records but the image holds 2 complete records (94 words)");
     EXPECT_EQ(testsupport::readFile(bench.workDir() / "RcvrChar_R1_Exported.txt"),
               "1\nR1\n25\n-3\n30");
     EXPECT_FALSE(std::filesystem::exists(bench.workDir() / "RcvrChar_A_Exported.txt"));
@@ -146,10 +151,11 @@ TEST(ExportCals, MillimetreWaveReadsPortFilesAndLowFrequencyNamesUseTheirFlashNa
     auto image = RcvrCharImage::withHeader("R1", 1, -1.5f, 20.0f);
     image.appendZeroRecord(5e6);
     storage::pushPortFile(bench.context(), "R1", image);
-    auto written = storage::exportStoredCals(bench.context(), {"R1 LOW FREQUENCY EXTENSION", "B"},
-                                             {{"R1 LOW FREQUENCY EXTENSION", 1}, {"B", 1}});
+    auto result = storage::exportStoredCals(bench.context(), {"R1 LOW FREQUENCY EXTENSION", "B"},
+                                            {{"R1 LOW FREQUENCY EXTENSION", 1}, {"B", 1}});
     // B has no data file: an empty image ends the export.
-    EXPECT_EQ(written, std::vector<std::string>{"RcvrChar_R1_LFE_Exported.txt"});
+    EXPECT_EQ(result.files, std::vector<std::string>{"RcvrChar_R1_LFE_Exported.txt"});
+    EXPECT_EQ(result.endedAt, "B");
     EXPECT_EQ(testsupport::readFile(bench.workDir() / "RcvrChar_R1_LFE_Exported.txt"),
               "1\nR1\n25\n-1.5\n20\n5000000, (0,0,0), (0,0,0), (0,0,0), (0,0,0)");
 }
