@@ -1,0 +1,232 @@
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+#include "SimFixture.h"
+#include "sim/Instrument.h"
+#include "sim/ReceiverPhysics.h"
+
+namespace {
+
+using simtest::SimFixture;
+
+TEST(ReceiverPhysics, ClosedFormInvertsTheCompressionCurve) {
+    for (double s : {0.5, 1.0, 2.0, 4.0}) {
+        sim::ReceiverParameters r{-7.0, s, 3.0, 0.0};
+        for (double x : {0.05, 0.1, 0.2, 0.5, 1.0}) {
+            double p = sim::compressionInputPowerDbm(r, x);
+            EXPECT_NEAR(-x, sim::compressionDb(r, p), 1e-9) << "s=" << s << " x=" << x;
+        }
+        // At saturation the compression is (10/s) log10(2), and far below it nothing.
+        EXPECT_NEAR(-10.0 / s * std::log10(2.0), sim::compressionDb(r, -7.0), 1e-12);
+        EXPECT_GT(sim::compressionDb(r, -150.0), -1e-6);
+        EXPECT_NEAR(3.0 * sim::compressionDb(r, -3.0), sim::compressionPhaseDeg(r, -3.0), 1e-12);
+    }
+}
+
+class Physics : public SimFixture {
+  protected:
+    // A power sweep of `points` points from start to stop dBm at 1 GHz, measuring `parameter`.
+    std::vector<float> powerSweep(const std::string& parameter, double start, double stop,
+                                  long points, int format = 1) {
+        scpi("CALC:PAR:DEL:ALL");
+        scpi("CALC:PAR:DEF:EXT \"m\",\"" + parameter + "\"");
+        auto ch = channel();
+        ch->setSweepType(2);
+        ch->setCwFrequency(1e9);
+        ch->setStartPower(start);
+        ch->setStopPower(stop);
+        ch->setNumberOfPoints(points);
+        ch->singleSweep();
+        EXPECT_EQ("0,\"No error\"", nextError());
+        return read("m", format);
+    }
+};
+
+TEST_F(Physics, FinePowerSweepFindsEveryReceiversCompressionPointsAtTheClosedForm) {
+    start(R"({"receivers": {"B": {"psat_dbm": 4.0, "smoothness": 2.0},
+                            "R3": {"psat_dbm": -15.0, "smoothness": 0.7}}})");
+    const double startDbm = -60.0;
+    const double stopDbm = 15.0;
+    const long points = 7501;  // 0.01 dB steps
+    const double step = (stopDbm - startDbm) / (points - 1);
+    for (const auto& receiver : m_analyzer->scenario().receiverNames()) {
+        SCOPED_TRACE(receiver);
+        const auto& physics = m_analyzer->scenario().receiver(receiver);
+        auto trace = powerSweep(receiver + ",1", startDbm, stopDbm, points);
+        ASSERT_EQ(static_cast<std::size_t>(points), trace.size());
+        for (double x : {0.05, 0.1, 0.2, 0.5}) {
+            double found = NAN;
+            for (long i = 1; i < points; ++i) {
+                double pin = startDbm + step * static_cast<double>(i);
+                double previous = trace[i - 1] - (pin - step);
+                double compression = trace[i] - pin;
+                if (compression <= -x) {
+                    // Interpolate between the two points that straddle -x.
+                    found = pin - step + step * (previous + x) / (previous - compression);
+                    break;
+                }
+            }
+            EXPECT_NEAR(sim::compressionInputPowerDbm(physics, x), found, 0.01) << "x=" << x;
+        }
+    }
+}
+
+TEST_F(Physics, RatioReadsPadPlusCompressionAndItsPhaseFollowsAmPm) {
+    start();
+    m_analyzer->instrument().cableReceivers({{"R1", 1, 20.0}});
+    auto mag = powerSweep("R1/A,1", -40.0, 10.0, 51);
+    auto phase = read("m", 2);
+    const auto& r1 = m_analyzer->scenario().receiver("R1");
+    for (std::size_t i = 0; i < mag.size(); i += 10) {
+        double input = -40.0 + static_cast<double>(i) - 20.0;
+        EXPECT_NEAR(20.0 + sim::compressionDb(r1, input), mag[i], 1e-4);
+        EXPECT_NEAR(r1.amPmDegPerDb * sim::compressionDb(r1, input), phase[i], 1e-4);
+    }
+}
+
+TEST_F(Physics, MemoryDivisionLeavesCompressionRelativeToTheReference) {
+    start();
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measmag\",\"A,1\"");
+    scpi("CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"");
+    auto ch = channel();
+    ch->setSweepType(3);
+    ch->setNumberOfPoints(5);
+    scpi("SOUR:POW -25,\"PORT 1\"");
+    ch->singleSweep();
+    scpi("CALC:PAR:SEL \"measratio\"");
+    scpi("CALC:math:mem");
+    scpi("CALC:math:func div");
+    EXPECT_EQ("0,\"No error\"", nextError());
+    scpi("SOUR:POW -5,\"PORT 1\"");
+    ch->singleSweep();
+    const auto& a = m_analyzer->scenario().receiver("A");
+    double expected = sim::compressionDb(a, -5.0) - sim::compressionDb(a, -25.0);
+    for (float v : read("measratio")) {
+        EXPECT_NEAR(expected, v, 1e-5);
+    }
+    EXPECT_LT(expected, -0.5);
+    // measmag is not divided: it reads the input power plus compression.
+    EXPECT_NEAR(-5.0 + sim::compressionDb(a, -5.0), read("measmag")[0], 1e-5);
+    // Back to normal display: the ratio reads pad (0) plus compression again.
+    scpi("CALC:math:func NORM");
+    EXPECT_NEAR(sim::compressionDb(a, -5.0), read("measratio")[0], 1e-5);
+}
+
+TEST_F(Physics, SegmentSweepUsesSegmentPowersAndCountsSegmentPoints) {
+    start();
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measmag\",\"C,3\"");
+    auto ch = channel();
+    auto table = automation::queryInterface<automation::SegmentTable>(ch->segmentTable());
+    ASSERT_TRUE(table);
+    table->writeTable({{1, 3, 1e9, 2e9, 1000, 0, -20}, {1, 4, 3e9, 4e9, 1000, 0, -2}});
+    table->enablePerSegmentPower();
+    ch->setSweepType(4);
+    EXPECT_EQ(7, ch->numberOfPoints());
+    EXPECT_DOUBLE_EQ(1e9, ch->startFrequency());
+    EXPECT_DOUBLE_EQ(4e9, ch->stopFrequency());
+    ch->setContinuousSweep(true);
+    auto trace = read("measmag");
+    const auto& c = m_analyzer->scenario().receiver("C");
+    ASSERT_EQ(7u, trace.size());
+    EXPECT_NEAR(-20.0 + sim::compressionDb(c, -20.0), trace[0], 1e-5);
+    EXPECT_NEAR(-2.0 + sim::compressionDb(c, -2.0), trace[6], 1e-5);
+    // Without per-segment power the port's source power applies.
+    m_app->reset();
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measmag\",\"C,3\"");
+    table = automation::queryInterface<automation::SegmentTable>(channel()->segmentTable());
+    table->writeTable({{1, 2, 1e9, 2e9, 1000, 0, -20}});
+    channel()->setSweepType(4);
+    scpi("SOUR:POW -12,\"PORT 3\"");
+    channel()->singleSweep();
+    EXPECT_NEAR(-12.0 + sim::compressionDb(c, -12.0), read("measmag")[1], 1e-5);
+    EXPECT_THROW(table->writeTable({{1, 0, 1e9, 2e9, 1000, 0, 0}}), std::string);
+    EXPECT_THROW(table->writeTable({{1, 5, 3e9, 2e9, 1000, 0, 0}}), std::string);
+}
+
+TEST_F(Physics, NarrowbandPathReadsThreeDbBelowWideband) {
+    start();
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measmag\",\"R2,2\"");
+    auto ch = channel();
+    ch->setSweepType(3);
+    scpi("SOUR:POW -10,\"PORT 2\"");
+    ch->singleSweep();
+    float wide = read("measmag")[0];
+    scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"NBF\"");
+    ch->singleSweep();
+    EXPECT_NEAR(-3.0, read("measmag")[0] - wide, 1e-5);
+    scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"WBF\"");
+    ch->singleSweep();
+    EXPECT_FLOAT_EQ(wide, read("measmag")[0]);
+}
+
+TEST_F(Physics, NoiseIsAveragedDownAndMeanStatisticReadsTheTrace) {
+    start(R"({"receivers": {"*": {"noise_db": 0.2}}})");
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"");
+    auto ch = channel();
+    ch->setSweepType(3);
+    ch->setNumberOfPoints(2000);
+    scpi("SOUR:POW -40,\"PORT 1\"");
+    auto spread = [&] {
+        auto trace = read("measratio");
+        double sum = 0.0;
+        for (float v : trace) {
+            sum += v * v;
+        }
+        return std::sqrt(sum / static_cast<double>(trace.size()));
+    };
+    ch->singleSweep();
+    double single = spread();
+    EXPECT_NEAR(0.2, single, 0.02);
+    scpi("SENS:AVER:STAT ON");
+    scpi("SENS:AVER:COUN 16");
+    for (int i = 0; i < 16; ++i) {
+        ch->singleSweep();
+    }
+    EXPECT_NEAR(0.05, spread(), 0.01);  // 0.2 / sqrt(16)
+    scpi("format:data ASC");
+    scpi("calculate:function:type MEAN");
+    double mean = std::atof(scpi("calculate:function:data?").c_str());
+    EXPECT_NEAR(0.0, mean, 0.005);
+}
+
+TEST_F(Physics, UnconnectedReceiverReadsTheNoiseFloorWhateverTheSource) {
+    start();
+    m_analyzer->instrument().cableReceivers({{"A", 1, 0.0}});
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"measmag\",\"A,2\"");  // port 2 is not cabled to A
+    auto ch = channel();
+    ch->setSweepType(3);
+    scpi("SOUR:POW 0,\"PORT 2\"");
+    ch->singleSweep();
+    EXPECT_FLOAT_EQ(static_cast<float>(sim::Instrument::noiseFloorDbm), read("measmag")[0]);
+}
+
+TEST_F(Physics, TraceReadsReportFailuresAsStatus) {
+    start();
+    auto m = automation::queryInterface<automation::MeasurementData>(m_app->currentMeasurement());
+    ASSERT_TRUE(m);
+    std::vector<float> buffer(201);
+    long points = 201;
+    EXPECT_NE(0, m->readData(2, 1, points, buffer));  // nothing swept yet
+    EXPECT_EQ(0, points);
+    channel()->singleSweep();
+    points = 201;
+    EXPECT_NE(0, m->readData(1, 1, points, buffer));   // wrong location
+    EXPECT_NE(0, m->readData(2, 99, points, buffer));  // unknown format
+    points = 201;
+    EXPECT_EQ(0, m->readData(2, 0, points, buffer));
+    EXPECT_EQ(201, points);
+    EXPECT_FLOAT_EQ(1.0f, buffer[0]);  // S11 of the preset reads 0 dB
+    points = 500;
+    std::vector<float> small(10);
+    EXPECT_EQ(0, m->readData(2, 1, points, small));
+    EXPECT_EQ(10, points);
+}
+
+}  // namespace
