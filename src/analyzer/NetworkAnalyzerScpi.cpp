@@ -24,6 +24,7 @@ std::string quoted(const std::string& command) {
 
 std::string CNetworkAnalyzer::sendscpi(std::string command) {
     if (!m_pParser) {
+        application();  // an absent application is the deeper fault
         throw std::string("could not create TVA SCPI Parser: the analyzer cannot be sent " +
                           quoted(command));
     }

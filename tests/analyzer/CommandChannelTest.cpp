@@ -10,6 +10,11 @@ TEST_F(ProxyTest, EveryCommandWaitsAndReturnsTheWholeReply) {
     EXPECT_EQ(proxy->sendscpi("DIAG:flasharray? \"RCVRCHAR\",\"A\""), longReply);
     EXPECT_EQ(proxy->sendscpi("SENS:AVER:CLE"), "");
     EXPECT_EQ(clock.totalWaited().count(), 100);
+
+    // A failing parser is not mistaken for an empty reply; the pause is kept all the same.
+    fake.parser->failingCommand = "*IDN?";
+    EXPECT_EQ(RAISED_TEXT(proxy->readmodel(true)), "link to the analyzer lost");
+    EXPECT_EQ(clock.totalWaited().count(), 150);
 }
 
 TEST_F(ProxyTest, ErrorQueueIsDrainedToTheLastCode) {

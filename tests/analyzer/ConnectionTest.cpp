@@ -19,6 +19,7 @@ TEST_F(ProxyTest, ConstructionFailurePaths) {
     EXPECT_EQ(ui.boxes()[0].box.text, "Unable to create COM object for TVA Application plain");
     EXPECT_EQ(ui.boxes()[0].box.caption, "Critical Error");
     EXPECT_EQ(RAISED_TEXT(orphan.preparecal()), "m_pTVAap != NULL");
+    EXPECT_EQ(RAISED_TEXT(orphan.readportcount(true)), "m_pTVAap != NULL");
 
     // An application without a parser: usable object, but no command can be sent.
     fake.application->parser = nullptr;

@@ -43,6 +43,9 @@ void FakeParser::reply(const std::string& command, std::vector<std::string> repl
 
 std::string FakeParser::parse(const std::string& command) {
     m_log->calls.push_back("scpi " + command);
+    if (command == failingCommand) {
+        throw std::string("link to the analyzer lost");
+    }
     auto it = m_replies.find(command);
     if (it == m_replies.end() || it->second.empty()) {
         return "";

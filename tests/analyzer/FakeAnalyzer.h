@@ -28,6 +28,8 @@ class FakeParser : public automation::ScpiParser {
     // Replies for one command, used in order; the last one repeats.
     void reply(const std::string& command, std::vector<std::string> replies);
     std::string parse(const std::string& command) override;
+    // A command that fails as a broken link would, by raising this text.
+    std::string failingCommand;
 
   private:
     std::shared_ptr<CallLog> m_log;
