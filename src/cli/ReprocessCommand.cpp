@@ -1,0 +1,115 @@
+// `rcvrchar reprocess`: judges a receiver's raw measured-data CSV again without the analyzer,
+// rebuilding the band plan and ladder from the configuration as a run would, and writes the
+// raw result file and the image.
+
+#include <fstream>
+#include <iostream>
+
+#include "cli/CommandRegistry.h"
+#include "config/OptionReply.h"
+#include "config/T3872Acomcal.h"
+#include "engine/CompressionData.h"
+#include "engine/MeasuredDataImport.h"
+#include "engine/TestParameters.h"
+#include "platform/ScriptedOperatorUi.h"
+#include "storage/ReceiverNames.h"
+#include "storage/ResultProcessing.h"
+
+namespace {
+
+struct ReprocessOptions {
+    std::string csv;
+    std::string receiver;
+    std::string model;
+    std::string options;
+    std::string file = "RcvrChar.dat";
+    std::string searchMode = "Port-Search";
+    double nbLoss = -3;
+    std::string nbAtten = "30";
+    bool mmwave = false;
+    std::string onBadData = "retest";
+    std::string out;
+};
+
+constexpr int kFailedCriteria = 2;
+
+int reprocess(const ReprocessOptions& options) {
+    CT3872Acomcal config;
+    config.SetModel(options.model);
+    config.SetOptions(SplitOptionReply(options.options));
+    config.ReadSequence(options.file);
+
+    const engine::RunConstants constants = engine::readRunConstants(config);
+    const engine::ReceiverSetup setup =
+        engine::chooseReceiverSetup(constants, options.receiver, options.searchMode);
+    engine::requireLevels(setup);
+    config.SetLFEMode(setup.lfe);
+
+    platform::ScriptedOperatorUi ui;
+    ui.answerAll(platform::Answer::Ok);
+    // Quitting is answered like a retest: no image, and the status tells it failed.
+    ui.badData({options.onBadData == "default" ? platform::BadDataChoice::Continue
+                                               : platform::BadDataChoice::Retest});
+
+    engine::CCompressionData store(ui);
+    store.loadTestParameters(config, setup.firstBand);
+    store.setPowerLevels(*setup.ladder);
+    engine::readAllMeasuredData(store, options.csv);
+    store.setNarrowbandLoss(static_cast<float>(options.nbLoss));
+    store.setNarrowbandAtten(options.nbAtten);
+
+    const std::string shortName = storage::shortReceiverName(options.receiver);
+    const std::filesystem::path out(options.out);
+    const auto judgement = storage::judgeResults(store, shortName, options.mmwave,
+                                                 out / ("rcvrCharRaw_" + shortName + ".txt"), ui);
+    if (judgement.accepted) {
+        const auto imagePath = out / ("RcvrChar_" + shortName + ".dat");
+        std::ofstream image(imagePath, std::ios::binary | std::ios::trunc);
+        const std::string bytes = judgement.image.bytes();
+        if (!image.write(bytes.data(), static_cast<std::streamsize>(bytes.size())) ||
+            !image.flush()) {
+            throw std::string("Cannot write the image " + imagePath.string());
+        }
+    }
+    if (judgement.passed) {
+        return 0;
+    }
+    std::cerr << (options.onBadData == "quit"
+                      ? "User aborted characterization due to bad data on receiver " + shortName
+                      : "The data of receiver " + shortName + " failed the bad-connection criteria")
+              << "\n";
+    return kFailedCriteria;
+}
+
+cli::CommandRegistration registration("reprocess", [](CLI::App& app) -> std::function<int()> {
+    auto options = std::make_shared<ReprocessOptions>();
+    app.description(
+        "Judge a receiver's raw measured-data CSV again without the analyzer.\n"
+        "Example: rcvrchar reprocess --csv RcvrChar_AllMeasuredData_A.csv --receiver A "
+        "--model T3872A --options 010,080 --out results\n"
+        "Exit status: 0 the data passed, 2 it failed the criteria, 1 an error.");
+    app.add_option("--csv", options->csv, "raw CSV written by a run")
+        ->required()
+        ->check(CLI::ExistingFile);
+    app.add_option("--receiver", options->receiver, "receiver name, e.g. A or R1")->required();
+    app.add_option("--model", options->model, "analyzer model, e.g. T3872A")->required();
+    app.add_option("--options", options->options, "installed options, e.g. 010,080");
+    app.add_option("--file", options->file, "configuration file")->capture_default_str();
+    app.add_option("--search-mode", options->searchMode, "search mode of the run")
+        ->check(CLI::IsMember({"Direct-Search", "Port-Search"}))
+        ->capture_default_str();
+    app.add_option("--nb-loss", options->nbLoss, "narrowband loss in dB")->capture_default_str();
+    app.add_option("--nb-atten", options->nbAtten, "narrowband attenuator setting")
+        ->capture_default_str();
+    app.add_flag("--mmwave", options->mmwave, "judge as on a millimetre-wave system");
+    app.add_option("--on-bad-data", options->onBadData,
+                   "answer to bad data: retest or quit (no image), default (defaulted image)")
+        ->check(CLI::IsMember({"retest", "quit", "default"}))
+        ->capture_default_str();
+    app.add_option("--out", options->out, "directory for the raw result file and the image")
+        ->required()
+        ->check(CLI::ExistingDirectory);
+    return [options] { return reprocess(*options); };
+});
+
+}  // namespace
