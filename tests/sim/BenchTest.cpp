@@ -14,7 +14,8 @@ using simtest::SimFixture;
 std::string describe(const std::vector<sim::Instrument::Cable>& cables) {
     std::string text;
     for (const auto& c : cables) {
-        text += c.receiver + "@" + std::to_string(c.port) + "/" + std::to_string(int(c.padDb)) + ";";
+        text +=
+            c.receiver + "@" + std::to_string(c.port) + "/" + std::to_string(int(c.padDb)) + ";";
     }
     return text;
 }
@@ -51,7 +52,7 @@ TEST(BenchInstructions, ReadsEveryKindOfConnectionInstruction) {
 
 // The connection check, the power-ratio check and a memory division, as the engine runs them.
 class Bench : public SimFixture {
-protected:
+  protected:
     void startBench(const std::string& scenario) {
         start(scenario);
         m_bench = std::make_unique<sim::SimulatedBench>(m_operator, *m_analyzer);
@@ -69,8 +70,7 @@ protected:
         m_port = port;
     }
     float reading(const std::string& name, double sourceDbm) {
-        scpi("SOUR:POW " + std::to_string(sourceDbm) + ",\"PORT " + std::to_string(m_port) +
-             "\"");
+        scpi("SOUR:POW " + std::to_string(sourceDbm) + ",\"PORT " + std::to_string(m_port) + "\"");
         channel()->setContinuousSweep(true);
         return read(name)[0];
     }
@@ -96,8 +96,9 @@ TEST_F(Bench, ForwardsEveryBoxAndAnswer) {
 
 TEST_F(Bench, HealthyCablingPassesEveryCheck) {
     startBench("{}");
-    instruct("Connect cable to PORT 1.\r\nConnect ** 20 ** pad to cable.\r\nConnect pad to "
-             "\"RCVR R1 IN\"");
+    instruct(
+        "Connect cable to PORT 1.\r\nConnect ** 20 ** pad to cable.\r\nConnect pad to "
+        "\"RCVR R1 IN\"");
     EXPECT_DOUBLE_EQ(20.0, m_analyzer->instrument().connectionOf("R1").lossDb);
     define("R1", "R1/A", 1);
     EXPECT_TRUE(connectionCheckPasses());
@@ -117,9 +118,10 @@ TEST_F(Bench, DisconnectedReceiverFailsThatManyConnectionChecks) {
     int failures = 0;
     while (!connectionCheckPasses() && failures < 5) {
         ++failures;
-        m_bench->messageBox({"Receiver C In does not seem to be connected to source Port 3\n"
-                             "Please check connection\nRetry? (no will continue)",
-                             "Check Connection", platform::Buttons::YesNo, 0});
+        m_bench->messageBox(
+            {"Receiver C In does not seem to be connected to source Port 3\n"
+             "Please check connection\nRetry? (no will continue)",
+             "Check Connection", platform::Buttons::YesNo, 0});
     }
     EXPECT_EQ(2, failures);
 }
@@ -143,10 +145,11 @@ TEST_F(Bench, WrongPadShowsInThePowerRatioUntilTheOperatorRechecks) {
     instruct(instruction);
     define("R2", "R2/B", 2);
     EXPECT_NEAR(10.0, reading("measratio", -25.0), 0.2);  // 10 dB less pad: some compression
-    m_bench->messageBox({"Expected power ratio: 20 +/- 5 dB\nPower ratio read: 10\nCheck "
-                         "connections, connection instructions were: \n\n" +
-                             instruction + "\n\nRetry? (no will continue)",
-                         "Unexpected power ratio reading", platform::Buttons::YesNo, 0});
+    m_bench->messageBox(
+        {"Expected power ratio: 20 +/- 5 dB\nPower ratio read: 10\nCheck "
+         "connections, connection instructions were: \n\n" +
+             instruction + "\n\nRetry? (no will continue)",
+         "Unexpected power ratio reading", platform::Buttons::YesNo, 0});
     EXPECT_NEAR(20.0, reading("measratio", -25.0), 0.05);
     // Fixed for good: the next instruction for R2 gets the right pad at once.
     instruct(instruction);
