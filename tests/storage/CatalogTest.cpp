@@ -145,3 +145,59 @@ TEST(CatalogFlash, ReadsTheSimulatorsFlashCatalog) {
                   {"R1", 1}, {"R2", -1}, {"A", 0}, {"B", 1}, {"R1 LOW FREQUENCY EXTENSION", 0}}));
     EXPECT_EQ(bench.commands(), std::vector<std::string>{"DIAG:FLASH:CAT?"});
 }
+
+namespace {
+
+const std::string kPortFolder =
+    "C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\T3951A Broadband\\Port ";
+
+void dateFile(const std::filesystem::path& file, system_clock::time_point when) {
+    std::filesystem::last_write_time(file, std::chrono::file_clock::from_sys(when));
+}
+
+}  // namespace
+
+TEST(CatalogFlash, MillimetreWaveListsEachDataFileAndReadsDateAndSize) {
+    storagetest::SimBench bench(std::string(storagetest::kMillimetreWave) + R"(, "stored": [
+        {"receiver": "R1", "age_days": 0, "records": 100},
+        {"receiver": "R2", "age_days": 0, "records": 3},
+        {"receiver": "A", "age_days": 0, "records": 3},
+        {"receiver": "B", "age_days": 0, "records": 3}])");
+    auto path = [&](int port, const char* file) {
+        return bench.local(kPortFolder + std::to_string(port) + "\\Factory Cal Data\\" + file);
+    };
+    ASSERT_EQ(std::filesystem::file_size(path(1, "RcvrCharRef.dat")), 5622u);
+    dateFile(path(1, "RcvrCharRef.dat"), localTime(2026, 3, 9, 16, 45));  // yesterday
+    dateFile(path(2, "RcvrCharRef.dat"), localTime(2026, 3, 3, 8, 0));    // 7 days
+    dateFile(path(1, "RcvrCharTest.dat"), localTime(2026, 3, 2, 23, 0));  // 8 days
+    testsupport::writeFile(path(2, "RcvrCharTest.dat"), "");              // size 0
+    std::vector<std::string> receivers = {
+        "R1", "R2", "R3", "A", "B", "C", "R1 LOW FREQUENCY EXTENSION"};
+
+    CatalogFindings morning{{"C", 3}};
+    storage::catalogFlash(bench.context(), *bench.processes, receivers, morning,
+                          localTime(2026, 3, 10, 11, 59));
+    EXPECT_EQ(morning, (CatalogFindings{{"R1", 1},
+                                        {"R2", 1},
+                                        {"R3", 0},
+                                        {"A", 1},
+                                        {"B", 0},
+                                        {"C", 3},
+                                        {"R1 LOW FREQUENCY EXTENSION", 1}}));
+    ASSERT_EQ(bench.processes->commands.size(), receivers.size());
+    EXPECT_EQ(bench.processes->commands[0],
+              "dir /-C \"" + kPortFolder + "1\\Factory Cal Data\\RcvrCharRef.dat\" > fileInfo.txt");
+    EXPECT_EQ(
+        bench.processes->commands[4],
+        "dir /-C \"" + kPortFolder + "2\\Factory Cal Data\\RcvrCharTest.dat\" > fileInfo.txt");
+    EXPECT_EQ(bench.processes->commands[6], bench.processes->commands[0]);
+    // The last listing stays in the working directory.
+    EXPECT_NE(testsupport::readFile(bench.workDir() / "fileInfo.txt").find("RcvrCharRef.dat"),
+              std::string::npos);
+    EXPECT_TRUE(bench.commands().empty());
+
+    CatalogFindings afternoon;
+    storage::catalogFlash(bench.context(), *bench.processes, {"A"}, afternoon,
+                          localTime(2026, 3, 10, 12, 0));
+    EXPECT_EQ(afternoon, (CatalogFindings{{"A", -1}}));
+}

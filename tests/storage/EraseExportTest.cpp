@@ -20,24 +20,6 @@ const std::string kPort2Test =
     "C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\T3951A Broadband\\Port 2\\"
     "Factory Cal Data\\RcvrCharTest.dat";
 
-// Carries out "del" on the simulator's drive and records every command.
-struct RecordingProcesses : platform::ProcessRunner {
-    explicit RecordingProcesses(const platform::PathMap& paths) : paths(paths) {}
-    int runProgram(const std::string& commandLine) override {
-        commands.push_back(commandLine);
-        return 0;
-    }
-    int runCommand(const std::string& command) override {
-        commands.push_back(command);
-        if (command.rfind("del \"", 0) == 0) {
-            std::filesystem::remove(paths.toLocal(command.substr(5, command.size() - 6)));
-        }
-        return 0;
-    }
-    const platform::PathMap& paths;
-    std::vector<std::string> commands;
-};
-
 std::string exportedText(const RcvrCharImage& image) {
     std::ostringstream out;
     storage::writeExportText(out, image);
@@ -50,10 +32,9 @@ TEST(EraseCal, MillimetreWaveDeletesTheFileAndPushesItsPort) {
     SimBench bench(std::string(storagetest::kMillimetreWave) +
                    R"(, "stored": [{"receiver": "B", "age_days": 1, "records": 2}])");
     ASSERT_TRUE(std::filesystem::exists(bench.local(kPort2Test)));
-    RecordingProcesses processes(bench.paths);
     CatalogFindings findings{{"B", 1}};
-    storage::eraseCal(bench.context(), processes, "B", findings);
-    EXPECT_EQ(processes.commands, std::vector<std::string>{"del \"" + kPort2Test + "\""});
+    storage::eraseCal(bench.context(), *bench.processes, "B", findings);
+    EXPECT_EQ(bench.processes->commands, std::vector<std::string>{"del \"" + kPort2Test + "\""});
     EXPECT_FALSE(std::filesystem::exists(bench.local(kPort2Test)));
     EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 2,0"});
     EXPECT_EQ(bench.logLines(), (std::vector<std::string>{
@@ -66,9 +47,8 @@ TEST(EraseCal, MillimetreWaveErrorBoxIsOwnedByTheDialog) {
     SimBench bench(std::string(storagetest::kMillimetreWave) + R"(, "faults": {"scpi_errors": [
         {"command": "diag:mm:data:push", "errors": ["-256,\"File name not found\""]}]})");
     bench.ui.answer("SCPI Error Writing Flash", {platform::Answer::Ok});
-    RecordingProcesses processes(bench.paths);
     CatalogFindings findings;
-    storage::eraseCal(bench.context(), processes, "R1 LOW FREQUENCY EXTENSION", findings);
+    storage::eraseCal(bench.context(), *bench.processes, "R1 LOW FREQUENCY EXTENSION", findings);
     ASSERT_EQ(bench.ui.boxes().size(), 1u);
     EXPECT_EQ(bench.ui.boxes()[0].box.flags, platform::BoxSystemModal | platform::BoxOwnedByDialog);
     EXPECT_EQ(bench.ui.boxes()[0].box.text, ",\"File name not found\"");
@@ -79,14 +59,13 @@ TEST(EraseCal, MillimetreWaveErrorBoxIsOwnedByTheDialog) {
 
 TEST(EraseCal, FlashAnalyzerErasesByFlashNameWithoutLogOrErrorCheck) {
     SimBench bench(R"("stored": [{"receiver": "R1", "age_days": 1, "records": 2}])");
-    RecordingProcesses processes(bench.paths);
     CatalogFindings findings{{"R1 LOW FREQUENCY EXTENSION", -1}};
-    storage::eraseCal(bench.context(), processes, "R1 LOW FREQUENCY EXTENSION", findings);
-    storage::eraseCal(bench.context(), processes, "R1", findings);
+    storage::eraseCal(bench.context(), *bench.processes, "R1 LOW FREQUENCY EXTENSION", findings);
+    storage::eraseCal(bench.context(), *bench.processes, "R1", findings);
     EXPECT_EQ(bench.commands(),
               (std::vector<std::string>{"DIAG:FLASH:file:erase \"RCVRCHAR\",\"R1_LFE\"",
                                         "DIAG:FLASH:file:erase \"RCVRCHAR\",\"R1\""}));
-    EXPECT_TRUE(processes.commands.empty());
+    EXPECT_TRUE(bench.processes->commands.empty());
     EXPECT_EQ(bench.logLines(), std::vector<std::string>{"Initialized file"});
     EXPECT_EQ(findings, (CatalogFindings{{"R1 LOW FREQUENCY EXTENSION", 3}, {"R1", 3}}));
     EXPECT_EQ(storage::readStoredImage(bench.context(), "R1").wordCount(), 1u);

@@ -15,6 +15,8 @@ SimBench::SimBench(const std::string& scenarioMembers)
     analyzer = std::make_unique<CNetworkAnalyzer>("", ui, clock);
     analyzer->readmodel(true);
     log.create();
+    simProcesses = std::make_unique<sim::SimProcessRunner>(*simulator, paths);
+    processes = std::make_unique<RecordingProcesses>(*simProcesses);
     simulator->clearTranscript();
 }
 

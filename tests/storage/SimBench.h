@@ -12,6 +12,7 @@
 #include "platform/Clock.h"
 #include "platform/PathMap.h"
 #include "platform/ScriptedOperatorUi.h"
+#include "sim/SimProcessRunner.h"
 #include "sim/SimulatedAnalyzer.h"
 #include "storage/FlashCommandLog.h"
 #include "storage/StorageContext.h"
@@ -22,6 +23,24 @@ namespace storagetest {
 inline constexpr const char* kMillimetreWave =
     R"("idn": "Velquor Technologies,T3872B,MY00000001,A.13.55.06",
        "mmwave_catalog": "Default,T3951A Broadband", "mmwave_active": "T3951A Broadband")";
+
+// The simulator's processes, with every command line recorded.
+class RecordingProcesses : public platform::ProcessRunner {
+  public:
+    explicit RecordingProcesses(platform::ProcessRunner& runner) : m_runner(runner) {}
+    int runProgram(const std::string& commandLine) override {
+        commands.push_back(commandLine);
+        return m_runner.runProgram(commandLine);
+    }
+    int runCommand(const std::string& command) override {
+        commands.push_back(command);
+        return m_runner.runCommand(command);
+    }
+    std::vector<std::string> commands;
+
+  private:
+    platform::ProcessRunner& m_runner;
+};
 
 class SimBench {
   public:
@@ -49,6 +68,8 @@ class SimBench {
     platform::DrivePathMap paths;
     storage::FlashCommandLog log;
     std::unique_ptr<CNetworkAnalyzer> analyzer;
+    std::unique_ptr<sim::SimProcessRunner> simProcesses;
+    std::unique_ptr<RecordingProcesses> processes;
 };
 
 }  // namespace storagetest
