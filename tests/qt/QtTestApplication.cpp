@@ -1,19 +1,40 @@
 #include "QtTestApplication.h"
 
+#include <gtest/gtest.h>
+
 #include <QApplication>
+#include <memory>
 
 namespace qttest {
+
+namespace {
+
+std::unique_ptr<QApplication>& application() {
+    static std::unique_ptr<QApplication> app;
+    return app;
+}
+
+// Qt must be shut down before the program's static objects go: at the end of the tests.
+class QtEnvironment : public ::testing::Environment {
+  public:
+    void TearDown() override { application().reset(); }
+};
+
+// Google Test takes ownership of the environment.
+[[maybe_unused]] const auto* const g_environment =
+    ::testing::AddGlobalTestEnvironment(std::make_unique<QtEnvironment>().release());
+
+}  // namespace
 
 QApplication& qtApplication() {
     static int argc = 1;
     static char name[] = "test_qt";
     static char* argv[] = {name, nullptr};
-    static QApplication* app = [] {
+    auto& app = application();
+    if (!app) {
         qputenv("QT_QPA_PLATFORM", "offscreen");
-        // Kept for the whole process: Qt's own shutdown must not race static destructors.
-        static QApplication instance(argc, argv);
-        return &instance;
-    }();
+        app = std::make_unique<QApplication>(argc, argv);
+    }
     return *app;
 }
 

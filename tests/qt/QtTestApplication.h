@@ -10,3 +10,11 @@ namespace qttest {
 QApplication& qtApplication();
 
 }  // namespace qttest
+
+#include <QString>
+#include <ostream>
+
+// Readable QString values in test failure messages.
+inline void PrintTo(const QString& text, std::ostream* out) {
+    *out << '"' << text.toStdString() << '"';
+}

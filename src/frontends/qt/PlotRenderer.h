@@ -1,5 +1,7 @@
 #pragma once
 
+#include "frontends/qt/QtKeywords.h"
+
 // Draws a characterization chart into an SVG or PNG file without a display.
 
 #include <QSize>
