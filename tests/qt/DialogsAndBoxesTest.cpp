@@ -1,0 +1,292 @@
+#include "frontends/qt/QtKeywords.h"
+
+#include <gtest/gtest.h>
+
+#include <QApplication>
+#include <QLabel>
+#include <QMessageBox>
+#include <QPushButton>
+#include <QTimer>
+#include <cstdlib>
+#include <future>
+#include <thread>
+
+#include "QtTestApplication.h"
+#include "TempDir.h"
+#include "frontends/qt/ControlIds.h"
+#include "frontends/qt/DialogUnits.h"
+#include "frontends/qt/QtBadDataDialog.h"
+#include "frontends/qt/QtDialogFrontEnd.h"
+#include "frontends/qt/QtOperatorUi.h"
+#include "frontends/qt/QtRestartDialog.h"
+#include "frontends/qt/RunProgressWatcher.h"
+#include "platform/ScriptedOperatorUi.h"
+
+namespace {
+
+using platform::Answer;
+using platform::BadDataChoice;
+using platform::Buttons;
+
+// Runs the Qt loop until done() or a second has passed.
+bool spinUntil(const std::function<bool()>& done) {
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(5);
+    while (!done()) {
+        if (std::chrono::steady_clock::now() > deadline) {
+            return false;
+        }
+        QApplication::processEvents(QEventLoop::AllEvents, 5);
+    }
+    return true;
+}
+
+QMessageBox* visibleBox(const QString& caption) {
+    for (auto* widget : QApplication::topLevelWidgets()) {
+        auto* box = qobject_cast<QMessageBox*>(widget);
+        if (box && box->isVisible() && box->windowTitle() == caption) {
+            return box;
+        }
+    }
+    return nullptr;
+}
+
+QAbstractButton* button(QWidget& dialog, int id) {
+    return qobject_cast<QAbstractButton*>(qtui::controlById(dialog, id));
+}
+
+class QtDialogs : public ::testing::Test {
+  protected:
+    void SetUp() override { qttest::qtApplication(); }
+};
+
+TEST_F(QtDialogs, BadDataDialogIsRelabelledForTheReceiver) {
+    app::RcvrCharBadDlg model("B");
+    platform::ScriptedOperatorUi ui;
+    qtui::QtBadDataDialog dialog(model, ui);
+    const qtui::DialogUnits du(dialog.font());
+    EXPECT_EQ(dialog.windowTitle(), "Characterization data issue!");
+    EXPECT_EQ(dialog.size(), du.size(188, 116));
+    EXPECT_EQ(qobject_cast<QLabel*>(qtui::controlById(dialog, 1019))->text(),
+              "The characterization data just taken for receiver B appears to be bad.  Please "
+              "select an action:");
+    auto* retest = qobject_cast<QPushButton*>(button(dialog, 1011));
+    EXPECT_EQ(retest->text(), "Retest Receiver B");
+    EXPECT_TRUE(retest->isDefault());
+    EXPECT_EQ(retest->geometry(), du.rect(33, 44, 113, 14));
+    EXPECT_EQ(button(dialog, 1010)->text(), "Don't retest, continue with remaining receivers.");
+    EXPECT_EQ(button(dialog, 1010)->geometry(), du.rect(15, 62, 158, 14));
+    EXPECT_EQ(button(dialog, 1016)->text(), "Quit");
+    EXPECT_EQ(button(dialog, 1016)->geometry(), du.rect(63, 82, 50, 14));
+}
+
+TEST_F(QtDialogs, BadDataDialogButtonsGiveTheirChoices) {
+    struct Case {
+        int id;
+        BadDataChoice choice;
+        bool pleaseNote;
+    };
+    for (const auto& c :
+         {Case{1011, BadDataChoice::Retest, true}, Case{1010, BadDataChoice::Continue, false},
+          Case{1016, BadDataChoice::Quit, false}}) {
+        app::RcvrCharBadDlg model("R2");
+        platform::ScriptedOperatorUi ui;
+        ui.answerAll(Answer::Ok);
+        qtui::QtBadDataDialog dialog(model, ui);
+        dialog.show();
+        button(dialog, c.id)->click();
+        EXPECT_FALSE(dialog.isVisible()) << c.id;
+        EXPECT_EQ(dialog.result(), QDialog::Accepted) << c.id;
+        EXPECT_EQ(dialog.choice(), c.choice) << c.id;
+        EXPECT_EQ(model.quitChosen(), c.choice == BadDataChoice::Quit) << c.id;
+        EXPECT_EQ(ui.captions(), c.pleaseNote ? std::vector<std::string>{"Please Note"}
+                                              : std::vector<std::string>{})
+            << c.id;
+    }
+    // Closing the window counts as "Don't retest".
+    app::RcvrCharBadDlg model("R2");
+    platform::ScriptedOperatorUi ui;
+    qtui::QtBadDataDialog dialog(model, ui);
+    dialog.show();
+    dialog.close();
+    EXPECT_EQ(dialog.choice(), BadDataChoice::Continue);
+}
+
+TEST_F(QtDialogs, RestartNoticeShowsItsText) {
+    qtui::QtRestartDialog notice("Restart", "Restarting TVA Application");
+    const qtui::DialogUnits du(notice.font());
+    EXPECT_EQ(notice.windowTitle(), "Restart");
+    EXPECT_EQ(notice.size(), du.size(118, 46));
+    auto* text = qobject_cast<QLabel*>(qtui::controlById(notice, 1008));
+    ASSERT_NE(text, nullptr);
+    EXPECT_EQ(text->text(), "Restarting TVA Application");
+    EXPECT_EQ(text->geometry(), du.rect(18, 20, 89, 12));
+}
+
+TEST_F(QtDialogs, BoxesMapCaptionTextButtonsAndAnswers) {
+    const platform::MessageBox yesNo{"Delete?\nSecond line", "Delete previous calibrations?",
+                                     Buttons::YesNo,
+                                     platform::BoxTopmost | platform::BoxIconInformation};
+    auto box = qtui::QtOperatorUi::makeBox(yesNo, nullptr);
+    EXPECT_EQ(box->windowTitle(), "Delete previous calibrations?");
+    EXPECT_EQ(box->text(), "Delete?\nSecond line");
+    EXPECT_EQ(box->textFormat(), Qt::PlainText);
+    EXPECT_EQ(box->standardButtons(), QMessageBox::Yes | QMessageBox::No);
+    EXPECT_EQ(box->standardButton(box->defaultButton()), QMessageBox::Yes);
+    EXPECT_EQ(box->icon(), QMessageBox::Information);
+    EXPECT_TRUE(box->windowFlags() & Qt::WindowStaysOnTopHint);
+    // Not answered by a button (closed): the escape answer.
+    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, Buttons::YesNo), Answer::No);
+    box->button(QMessageBox::Yes)->click();
+    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, Buttons::YesNo), Answer::Yes);
+
+    auto okCancel = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::OkCancel, 0}, nullptr);
+    EXPECT_EQ(okCancel->standardButtons(), QMessageBox::Ok | QMessageBox::Cancel);
+    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Cancel);
+    okCancel->button(QMessageBox::Ok)->click();
+    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Ok);
+    auto ok = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::Ok, 0}, nullptr);
+    EXPECT_EQ(ok->standardButtons(), QMessageBox::Ok);
+    EXPECT_EQ(ok->icon(), QMessageBox::NoIcon);
+    EXPECT_FALSE(ok->windowFlags() & Qt::WindowStaysOnTopHint);
+}
+
+TEST_F(QtDialogs, UiThreadBoxIsModalAndReturnsTheButtonPressed) {
+    qtui::QtOperatorUi ui;
+    bool wasModal = false;
+    QTimer::singleShot(20, [&] {
+        QMessageBox* box = visibleBox("Abort now?");
+        ASSERT_NE(box, nullptr);
+        wasModal = box->isModal();
+        box->button(QMessageBox::No)->click();
+    });
+    EXPECT_EQ(ui.messageBox({"Are you sure you want to abort?", "Abort now?", Buttons::YesNo,
+                             platform::BoxSystemModal}),
+              Answer::No);
+    EXPECT_TRUE(wasModal);
+}
+
+TEST_F(QtDialogs, WorkerBoxLeavesTheUiThreadFreeAndOnlyTheWorkerWaits) {
+    qtui::QtOperatorUi ui;
+    auto answer = std::async(std::launch::async, [&] {
+        return ui.messageBox({"Connect the cable", "Connections", Buttons::OkCancel, 0});
+    });
+    ASSERT_TRUE(spinUntil([] { return visibleBox("Connections") != nullptr; }));
+    QMessageBox* box = visibleBox("Connections");
+    EXPECT_FALSE(box->isModal());
+    EXPECT_EQ(box->parentWidget(), nullptr);
+    EXPECT_EQ(QApplication::activeModalWidget(), nullptr);
+    EXPECT_EQ(ui.openWorkerBoxes(), 1u);
+    EXPECT_EQ(answer.wait_for(std::chrono::milliseconds(0)), std::future_status::timeout);
+    box->button(QMessageBox::Cancel)->click();
+    EXPECT_EQ(answer.get(), Answer::Cancel);
+    EXPECT_EQ(ui.openWorkerBoxes(), 0u);
+}
+
+TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
+    qtui::QtOperatorUi ui;
+    auto choice = std::async(std::launch::async, [&] { return ui.badDataChoice("C"); });
+    qtui::QtBadDataDialog* dialog = nullptr;
+    ASSERT_TRUE(spinUntil([&] {
+        for (auto* widget : QApplication::topLevelWidgets()) {
+            if (auto* found = qobject_cast<qtui::QtBadDataDialog*>(widget);
+                found && found->isVisible()) {
+                dialog = found;
+            }
+        }
+        return dialog != nullptr;
+    }));
+    QWidget* owner = nullptr;
+    QTimer::singleShot(20, [&] {
+        QMessageBox* note = visibleBox("Please Note");
+        ASSERT_NE(note, nullptr);
+        owner = note->parentWidget();
+        note->button(QMessageBox::Ok)->click();
+    });
+    dialog->activateWindow();
+    button(*dialog, 1011)->click();
+    EXPECT_EQ(choice.get(), BadDataChoice::Retest);
+    EXPECT_EQ(owner, dialog);
+}
+
+TEST_F(QtDialogs, ClosingWorkerBoxesReleasesTheWaitingWorker) {
+    qtui::QtOperatorUi ui;
+    auto answer = std::async(std::launch::async, [&] {
+        return ui.messageBox({"Check the cable", "Check Connection", Buttons::YesNo, 0});
+    });
+    ASSERT_TRUE(spinUntil([] { return visibleBox("Check Connection") != nullptr; }));
+    ui.closeWorkerBoxes();
+    EXPECT_EQ(answer.get(), Answer::No);
+    EXPECT_EQ(visibleBox("Check Connection"), nullptr);
+    // Later boxes from the worker are answered at once, as closed.
+    auto later = std::async(std::launch::async, [&] {
+        return ui.messageBox({"Again", "Connections", Buttons::OkCancel, 0});
+    });
+    EXPECT_EQ(later.get(), Answer::Cancel);
+}
+
+TEST(QtRunProgress, CompletionIsReportedForTheReceiverUnderWay) {
+    qtui::RunProgressWatcher watcher;
+    EXPECT_EQ(watcher.onNotice("Cal Started\r\n"), std::nullopt);
+    EXPECT_EQ(watcher.onNotice("Started Cal R1 LOW FREQUENCY EXTENSION\r\n"), std::nullopt);
+    EXPECT_EQ(watcher.onNotice("Cal will be repeated\r\n"), std::nullopt);
+    EXPECT_EQ(watcher.onNotice("Cal Complete\r\n"), "R1 LOW FREQUENCY EXTENSION");
+    // A second completion without a new start names nobody.
+    EXPECT_EQ(watcher.onNotice("Cal Complete\r\n"), std::nullopt);
+    watcher.onNotice("Started Cal A\r\n");
+    watcher.onNotice("Characterization Aborted\r\n");
+    EXPECT_EQ(watcher.onNotice("Cal Complete\r\n"), std::nullopt);
+}
+
+// Sets or clears environment variables for one test and restores them.
+class EnvironmentScope {
+  public:
+    explicit EnvironmentScope(
+        std::vector<std::pair<std::string, std::optional<std::string>>> values) {
+        for (auto& [name, value] : values) {
+            const char* old = std::getenv(name.c_str());
+            m_saved.emplace_back(name, old ? std::optional<std::string>(old) : std::nullopt);
+            set(name, value);
+        }
+    }
+    ~EnvironmentScope() {
+        for (auto& [name, value] : m_saved) {
+            set(name, value);
+        }
+    }
+
+  private:
+    static void set(const std::string& name, const std::optional<std::string>& value) {
+        if (value) {
+            setenv(name.c_str(), value->c_str(), 1);
+        } else {
+            unsetenv(name.c_str());
+        }
+    }
+    std::vector<std::pair<std::string, std::optional<std::string>>> m_saved;
+};
+
+TEST(QtDisplay, MissingDisplayIsExplained) {
+    {
+        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt},
+                              {"WAYLAND_DISPLAY", std::nullopt},
+                              {"DISPLAY", std::nullopt}});
+        EXPECT_EQ(qtui::missingDisplay(), "no display: neither DISPLAY nor WAYLAND_DISPLAY is set");
+    }
+    {
+        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt},
+                              {"WAYLAND_DISPLAY", std::nullopt},
+                              {"DISPLAY", ":4711.0"}});
+        EXPECT_EQ(qtui::missingDisplay(),
+                  "no display: DISPLAY is :4711.0 but no X server listens at /tmp/.X11-unix/X4711");
+    }
+    {
+        EnvironmentScope env({{"QT_QPA_PLATFORM", "offscreen"}, {"DISPLAY", std::nullopt}});
+        EXPECT_EQ(qtui::missingDisplay(), std::nullopt);
+    }
+    {
+        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt}, {"WAYLAND_DISPLAY", "wayland-0"}});
+        EXPECT_EQ(qtui::missingDisplay(), std::nullopt);
+    }
+}
+
+}  // namespace
