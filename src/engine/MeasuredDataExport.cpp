@@ -49,11 +49,11 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
         appendGeneral(text, m_frequencies[j], 15);
         for (std::size_t i = 0; i < rows; ++i) {
             text += ',';
-            appendGeneral(text, readingAt(m_testMag, i, j), 8);
+            appendFloat8(text, readingAt(m_testMag, i, j));
             text += ',';
-            appendGeneral(text, readingAt(m_ratioMag, i, j), 8);
+            appendFloat8(text, readingAt(m_ratioMag, i, j));
             text += ',';
-            appendGeneral(text, readingAt(m_phase, i, j), 8);
+            appendFloat8(text, readingAt(m_phase, i, j));
         }
         text += '\n';
         if (text.size() >= flushAt) {

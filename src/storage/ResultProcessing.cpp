@@ -38,6 +38,7 @@ class RawResultWriter {
     bool on() const { return m_file != nullptr; }
     void text(std::string_view text) { m_text += text; }
     void number(double value, int digits) { engine::appendGeneral(m_text, value, digits); }
+    void reading(float value) { engine::appendFloat8(m_text, value); }
     void endBlock() {
         if (m_text.size() >= kFlushAt) {
             flush();
@@ -114,11 +115,11 @@ void writeRawLine(RawResultWriter& raw, double frequency, const RecordPoints& po
     raw.number(frequency, 15);
     for (const auto& point : points) {
         raw.text(", (");
-        raw.number(point.power, 8);
+        raw.reading(point.power);
         raw.text(",");
-        raw.number(point.value, 8);
+        raw.reading(point.value);
         raw.text(",");
-        raw.number(point.phase, 8);
+        raw.reading(point.phase);
         raw.text(")");
     }
 }
