@@ -104,6 +104,7 @@ void Instrument::preset() {
     m_pathElements["IFSIGPATHALL"] = "WBF";
     m_pathElements["PORT1REFMXR"] = "INTERNAL";
     m_sourcePower.clear();
+    m_powerCoupled = true;
     m_statisticsType = "MEAN";
     m_statistics = false;
     m_lowFrequencyExtension = false;

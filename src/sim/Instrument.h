@@ -193,6 +193,7 @@ class Instrument {
     std::map<std::pair<int, int>, double> m_traceScale;
     std::map<std::string, std::string> m_pathElements;
     std::map<int, double> m_sourcePower;
+    bool m_powerCoupled = true;
     std::map<std::string, bool> m_diagStates;
     std::string m_statisticsType = "MEAN";
     bool m_statistics = false;

@@ -161,9 +161,21 @@ void Instrument::buildCommands() {
         if (power < -90.0 || power > 20.0) {
             throw ScpiError{-222, "Data out of range; source power -90 to 20 dBm"};
         }
-        m_sourcePower[port] = power;
+        // Port powers are coupled, as after a preset: one level for every port.
+        if (m_powerCoupled) {
+            for (int p = 1; p <= m_scenario.portCount; ++p) {
+                m_sourcePower[p] = power;
+            }
+        } else {
+            m_sourcePower[port] = power;
+        }
         return std::string();
     });
+    t.add("SOURce#:POWer#:COUPle", [this](C& c) {
+        m_powerCoupled = c.parameters.boolean();
+        return std::string();
+    });
+    t.add("SOURce#:POWer#:COUPle?", [this](C&) { return std::string(m_powerCoupled ? "1" : "0"); });
     t.add("SOURce#:POWer#:[LEVel]:[IMMediate]:[AMPLitude]?",
           [this, portOf](C& c) { return nr3(sourcePowerDbm(portOf(c))); });
 

@@ -121,7 +121,12 @@ TEST_F(Scpi, KeywordsMatchInShortAndLongFormAnyCase) {
     EXPECT_EQ("7", scpi("SENS:AVER:COUN?"));
     scpi("SOUR:POW -25,\"PORT 2\"");
     EXPECT_EQ("-2.50000000000E+01", scpi("SOURce:POWer? \"Port 2\""));
-    EXPECT_EQ("-1.00000000000E+01", scpi("SOUR:POW? \"PORT 1\""));
+    // Port powers are coupled after a preset; uncoupled, each port keeps its own.
+    EXPECT_EQ("-2.50000000000E+01", scpi("SOUR:POW? \"PORT 1\""));
+    scpi("SOUR:POW:COUP OFF");
+    scpi("SOUR:POW -5,\"PORT 1\"");
+    EXPECT_EQ("-5.00000000000E+00", scpi("SOUR:POW? \"PORT 1\""));
+    EXPECT_EQ("-2.50000000000E+01", scpi("SOUR:POW? \"PORT 2\""));
     scpi("SOUR:POW 40,\"PORT 1\"");
     scpi("SOUR:POW -20,\"PORT 9\"");
     EXPECT_EQ("-222,\"Data out of range; source power -90 to 20 dBm\"", nextError());
