@@ -140,7 +140,9 @@ std::size_t CTarvexDlg::storedWords(const std::string& receiver) {
                                       : receiver;
     const std::string reply =
         m_proxy->sendscpi("DIAG:flasharray? \"RCVRCHAR\",\"" + flashName + "\"");
-    return static_cast<std::size_t>(std::count(reply.begin(), reply.end(), ',')) + 1;
+    // The reply's first character is not part of the list.
+    const auto fields = reply.empty() ? reply.end() : reply.begin() + 1;
+    return static_cast<std::size_t>(std::count(fields, reply.end(), ',')) + 1;
 }
 
 void CTarvexDlg::findOldCals(RunRequest& request) {
