@@ -2,6 +2,7 @@
 
 #include "app/DialogServices.h"
 #include "app/RcvrCharBadDlg.h"
+#include "frontends/console/TextLines.h"
 
 namespace console {
 
@@ -45,7 +46,7 @@ AnswerWord ConsoleOperatorUi::ask(const BoxQuestion& question) {
     }
     if (!m_stopped.exchange(true)) {
         m_output.error("rcvrchar: no answer for the box [" + question.caption + "] " +
-                       question.text + "\n(" + reason + ")\n");
+                       terminalLineEnds(question.text) + "\n(" + reason + ")\n");
         if (m_onStop) {
             m_onStop();
         }

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "frontends/console/TextLines.h"
+
 namespace console {
 
 namespace {
@@ -25,8 +27,8 @@ std::optional<AnswerWord> fitting(const std::string& line, const std::vector<Ans
 }  // namespace
 
 void InteractiveAnswerer::prompt(const BoxQuestion& question) {
-    m_output.write("\n[" + question.caption + "] " + question.text + "\n  answer " +
-                   choices(question.allowed) + " > ");
+    m_output.write("\n[" + question.caption + "] " + terminalLineEnds(question.text) +
+                   "\n  answer " + choices(question.allowed) + " > ");
 }
 
 std::optional<AnswerWord> InteractiveAnswerer::answer(const BoxQuestion& question,

@@ -1,5 +1,7 @@
 #include "frontends/console/ScriptedAnswerer.h"
 
+#include "frontends/console/TextLines.h"
+
 namespace console {
 
 std::optional<AnswerWord> ScriptedAnswerer::answer(const BoxQuestion& question,
@@ -7,8 +9,8 @@ std::optional<AnswerWord> ScriptedAnswerer::answer(const BoxQuestion& question,
     std::lock_guard lock(m_mutex);
     const auto word = m_book.next(question.caption, question.allowed, reason);
     if (word) {
-        m_output.write("[" + question.caption + "] " + question.text + " => " + wordText(*word) +
-                       "\n");
+        m_output.write("[" + question.caption + "] " + terminalLineEnds(question.text) + " => " +
+                       wordText(*word) + "\n");
     }
     return word;
 }
