@@ -63,10 +63,9 @@ int CCSVRow::FindCell(const std::string& key, bool exact, int first, int last) c
     int end = static_cast<int>(m_cells.size()) - 1;
     int from = first < 0 ? 0 : first;
     int to = (last < 0 || last > end) ? end : last;
-    std::string upperKey = exact ? key : ToUpper(key);
     for (int i = from; i <= to; ++i) {
-        std::string text = ToUpper(m_cells[i]->GetText());
-        bool hit = exact ? text == upperKey : text.find(upperKey) != std::string::npos;
+        const std::string& text = m_cells[i]->GetText();
+        bool hit = exact ? ToUpper(text) == key : ContainsNoCase(text, key);
         if (hit) {
             return i;
         }
@@ -105,6 +104,6 @@ const std::string& CCSVRow::TextOrEmpty(std::size_t index) const {
 }
 
 void CCSVRow::AddOwnedCell(std::string text) {
-    m_owned.push_back(std::make_unique<CCell>(std::move(text)));
-    m_cells.push_back(m_owned.back().get());
+    m_owned.emplace_back(std::move(text));
+    m_cells.push_back(&m_owned.back());
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <deque>
 #include <istream>
 #include <memory>
 #include <string>
@@ -50,5 +51,5 @@ class CCSVRow {
 
   private:
     std::vector<const CCell*> m_cells;
-    std::vector<std::unique_ptr<CCell>> m_owned;
+    std::deque<CCell> m_owned;  // stable addresses for the views of other rows
 };

@@ -99,9 +99,8 @@ int CContainer::FindColumn(const std::string& name, int firstColumn) const {
     if (!m_headerFlag) {
         return -1;
     }
-    std::string key = ToUpper(name);
     for (int i = std::max(firstColumn, 0); i < static_cast<int>(m_header.CellCount()); ++i) {
-        if (m_header.GetText(i).find(key) != std::string::npos) {
+        if (ContainsNoCase(m_header.GetText(i), name)) {
             return i;
         }
     }

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <random>
 
+#include "ConfigTestFiles.h"
 #include "TempDir.h"
 #include "config/T3872Acomcal.h"
 
@@ -10,7 +11,7 @@ namespace {
 
 // Reads text as the dialog does. Only the two error kinds of the system may escape; any other
 // exception (out of range, bad allocation) or a crash under the sanitizers is a fault.
-void readOrFailCleanly(const testsupport::TempDir& dir, const std::string& text,
+bool readOrFailCleanly(const testsupport::TempDir& dir, const std::string& text,
                        const std::string& label) {
     auto path = dir / "RcvrChar.dat";
     testsupport::writeFile(path, text);
@@ -19,6 +20,7 @@ void readOrFailCleanly(const testsupport::TempDir& dir, const std::string& text,
     config.SetOptions({"010", "080"});
     try {
         config.ReadSequence(path.string());
+        return true;
     } catch (const std::string& error) {
         EXPECT_FALSE(error.empty()) << label;
     } catch (const char* error) {
@@ -26,6 +28,7 @@ void readOrFailCleanly(const testsupport::TempDir& dir, const std::string& text,
     } catch (const std::exception& e) {
         ADD_FAILURE() << label << ": unexpected " << e.what();
     }
+    return false;
 }
 
 std::vector<std::string> lines(const std::string& text) {
@@ -42,6 +45,8 @@ std::vector<std::string> lines(const std::string& text) {
 class ReaderRobustness : public ::testing::Test {
   protected:
     std::string m_sample = testsupport::readFile(testsupport::sampleConfiguration());
+    // Small enough to read hundreds of variants quickly under the sanitizers.
+    std::string m_small = configtest::minimalConfiguration();
     testsupport::TempDir m_dir;
     std::mt19937 m_random{20240611};
 };
@@ -55,14 +60,18 @@ TEST_F(ReaderRobustness, SampleReadsCleanly) {
 }
 
 TEST_F(ReaderRobustness, TruncatedFiles) {
-    for (int i = 0; i < 150; ++i) {
+    for (int i = 0; i < 15; ++i) {
         std::size_t cut = m_random() % m_sample.size();
-        readOrFailCleanly(m_dir, m_sample.substr(0, cut), "cut at " + std::to_string(cut));
+        readOrFailCleanly(m_dir, m_sample.substr(0, cut), "sample cut at " + std::to_string(cut));
+    }
+    for (std::size_t cut = 0; cut < m_small.size(); cut += 7) {
+        readOrFailCleanly(m_dir, m_small.substr(0, cut), "cut at " + std::to_string(cut));
     }
 }
 
 TEST_F(ReaderRobustness, ShuffledAndDroppedLines) {
-    auto all = lines(m_sample);
+    auto all = lines(m_small);
+    int read = 0;
     for (int i = 0; i < 60; ++i) {
         auto shuffled = all;
         // Shuffle a window so that some structure survives and deeper code is reached.
@@ -78,14 +87,17 @@ TEST_F(ReaderRobustness, ShuffledAndDroppedLines) {
         for (const auto& line : shuffled) {
             text += line;
         }
-        readOrFailCleanly(m_dir, text, "shuffle " + std::to_string(i));
+        read += readOrFailCleanly(m_dir, text, "shuffle " + std::to_string(i));
     }
+    // Some variants must get through, or the deeper steps were never reached.
+    EXPECT_GT(read, 0);
 }
 
 TEST_F(ReaderRobustness, MutatedBytes) {
     const std::string specials = ",\"\n\r &0x-9";
-    for (int i = 0; i < 150; ++i) {
-        std::string text = m_sample;
+    int read = 0;
+    for (int i = 0; i < 120; ++i) {
+        std::string text = m_small;
         for (int k = 0; k < 1 + i % 8; ++k) {
             std::size_t at = m_random() % text.size();
             switch (m_random() % 3) {
@@ -93,21 +105,22 @@ TEST_F(ReaderRobustness, MutatedBytes) {
                     text[at] = specials[m_random() % specials.size()];
                     break;
                 case 1:
-                    text.erase(at, 1 + m_random() % 20);
+                    text.erase(at, 1 + m_random() % 10);
                     break;
                 default:
                     text.insert(at, 1, static_cast<char>(m_random() % 256));
             }
         }
-        readOrFailCleanly(m_dir, text, "mutation " + std::to_string(i));
+        read += readOrFailCleanly(m_dir, text, "mutation " + std::to_string(i));
     }
+    EXPECT_GT(read, 0);
 }
 
 TEST_F(ReaderRobustness, RandomText) {
     const std::string alphabet = "T3872A,\"\n\r x0-9Banded";
-    for (int i = 0; i < 40; ++i) {
+    for (int i = 0; i < 20; ++i) {
         std::string text = i % 2 ? "T3872\n\nT3872A,Value,a,b,c\n" : "";
-        std::size_t length = m_random() % 3000;
+        std::size_t length = m_random() % 2000;
         for (std::size_t k = 0; k < length; ++k) {
             text += alphabet[m_random() % alphabet.size()];
         }
