@@ -32,7 +32,9 @@ QApplication& qtApplication() {
     static char* argv[] = {name, nullptr};
     auto& app = application();
     if (!app) {
-        qputenv("QT_QPA_PLATFORM", "offscreen");
+        // RCVRCHAR_TEST_PLATFORM=xcb shows the windows on a display while the tests run.
+        const QByteArray platform = qgetenv("RCVRCHAR_TEST_PLATFORM");
+        qputenv("QT_QPA_PLATFORM", platform.isEmpty() ? QByteArray("offscreen") : platform);
         app = std::make_unique<QApplication>(argc, argv);
     }
     return *app;
