@@ -111,15 +111,18 @@ void TarvexWindow::buildControls() {
     setTabOrder(m_log, m_list);
     setTabOrder(m_list, m_export);
 
-    auto call = [this](void (app::CTarvexDlg::*handler)()) {
-        return [this, handler] { guarded([this, handler] { (m_controller->*handler)(); }); };
-    };
-    connect(m_exit, &QPushButton::clicked, this, call(&app::CTarvexDlg::onExit));
-    connect(m_run, &QPushButton::clicked, this, call(&app::CTarvexDlg::onRun));
-    connect(m_abort, &QPushButton::clicked, this, call(&app::CTarvexDlg::onAbort));
-    connect(m_selectAll, &QPushButton::clicked, this, call(&app::CTarvexDlg::onSelectAll));
-    connect(m_clearAll, &QPushButton::clicked, this, call(&app::CTarvexDlg::onClearAll));
-    connect(m_export, &QPushButton::clicked, this, call(&app::CTarvexDlg::onExport));
+    connect(m_exit, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onExit(); }); });
+    connect(m_run, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onRun(); }); });
+    connect(m_abort, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onAbort(); }); });
+    connect(m_selectAll, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onSelectAll(); }); });
+    connect(m_clearAll, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onClearAll(); }); });
+    connect(m_export, &QPushButton::clicked, this,
+            [this] { guarded([this] { m_controller->onExport(); }); });
     connect(m_list, &QListWidget::itemSelectionChanged, this,
             &TarvexWindow::onListSelectionChanged);
 
@@ -130,7 +133,8 @@ void TarvexWindow::buildControls() {
     m_windowMenu->addAction("&Close", this, &QWidget::close);
     m_windowMenu->addSeparator();
     m_aboutAction = m_windowMenu->addAction("&About Receiver Characterization...");
-    connect(m_aboutAction, &QAction::triggered, this, call(&app::CTarvexDlg::onAbout));
+    connect(m_aboutAction, &QAction::triggered, this,
+            [this] { guarded([this] { m_controller->onAbout(); }); });
     auto* menuKey = new QShortcut(QKeySequence(Qt::ALT | Qt::Key_Space), this);
     connect(menuKey, &QShortcut::activated, this,
             [this] { m_windowMenu->popup(mapToGlobal(QPoint(0, 0))); });
