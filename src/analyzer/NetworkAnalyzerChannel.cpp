@@ -4,8 +4,8 @@
 #include <algorithm>
 
 #include "analyzer/NetworkAnalyzerClass.h"
-#include "analyzer/NumberText.h"
 #include "analyzer/UpperCase.h"
+#include "platform/NumberText.h"
 
 using analyzer::upperCased;
 using automation::queryInterface;
@@ -89,7 +89,7 @@ long CNetworkAnalyzer::readnumberofpoints(bool query) {
 double CNetworkAnalyzer::readsourcepower(bool query) {
     if (query) {
         m_sourcePower =
-            analyzer::leadingDouble(sendscpi("SOUR:POW? \"" + m_measurementPort + "\""));
+            platform::leadingDouble(sendscpi("SOUR:POW? \"" + m_measurementPort + "\""));
     }
     return m_sourcePower;
 }
@@ -103,7 +103,7 @@ void CNetworkAnalyzer::setsourcepower(double power, bool force) {
         return;
     }
     std::string command = "SOUR:POW ";
-    analyzer::appendStreamNumber(command, power);
+    platform::appendGeneral(command, power, 6);
     command += ",\"" + m_measurementPort + "\"";
     sendscpi(std::move(command));
     // Without this a later set back to the last read value would be skipped.

@@ -1,8 +1,8 @@
 // Construction, the held automation objects and the instrument's identification.
 
 #include "analyzer/NetworkAnalyzerClass.h"
-#include "analyzer/NumberText.h"
 #include "analyzer/automation/BackendFactory.h"
+#include "platform/NumberText.h"
 
 using automation::queryInterface;
 
@@ -141,7 +141,7 @@ std::vector<std::string> CNetworkAnalyzer::readoptions(bool query) {
 
 int CNetworkAnalyzer::readportcount(bool query) {
     if (query) {
-        m_portCount = analyzer::leadingInteger(sendscpi("diag:portcount?"));
+        m_portCount = platform::leadingInteger(sendscpi("diag:portcount?"));
     }
     return m_portCount;
 }

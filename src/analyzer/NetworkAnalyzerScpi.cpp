@@ -3,7 +3,7 @@
 #include <chrono>
 
 #include "analyzer/NetworkAnalyzerClass.h"
-#include "analyzer/NumberText.h"
+#include "platform/NumberText.h"
 
 namespace {
 
@@ -49,7 +49,7 @@ int CNetworkAnalyzer::checkerrors(std::string& errors) {
             throw std::string("CNetworkAnalyzer::checkerrors cannot read the SYST:ERR? reply \"" +
                               reply + "\" (code, comma, message expected)");
         }
-        const int code = analyzer::leadingInteger(reply.substr(0, comma));
+        const int code = platform::leadingInteger(reply.substr(0, comma));
         if (code == 0) {
             return result;
         }

@@ -5,6 +5,7 @@
 #include "config/ConfigurationFile.h"
 #include "config/NumberText.h"
 #include "config/TextMatch.h"
+#include "platform/NumberText.h"
 
 namespace {
 
@@ -209,10 +210,10 @@ void CNAData::ReadSequence(const std::string& path) {
             }
             for (const auto& position : SplitPositions(cells[row])) {
                 CSub sub(subNames[row]);
-                sub.SetPosition(TextToInt(position));
-                sub.SetIFBW(TextToInt(ifbws[row]));
-                sub.SetNumPoints(TextToInt(points[row]));
-                sub.SetTolerance(ToFloat(TextToDouble(tolerances[row])));
+                sub.SetPosition(platform::leadingInteger(position));
+                sub.SetIFBW(platform::leadingInteger(ifbws[row]));
+                sub.SetNumPoints(platform::leadingInteger(points[row]));
+                sub.SetTolerance(ToFloat(platform::leadingDouble(tolerances[row])));
                 calibration.AddSub(sub);
             }
         }
@@ -230,7 +231,7 @@ void CNAData::ReadSequence(const std::string& path) {
         bool qualifies =
             last ? named && !constantNames[i - 1].empty() : named && !constantNames[i + 1].empty();
         if (qualifies) {
-            SetConstant(constantNames[i], TextToDouble(constantValues[i]));
+            SetConstant(constantNames[i], platform::leadingDouble(constantValues[i]));
         }
     }
 
@@ -239,7 +240,7 @@ void CNAData::ReadSequence(const std::string& path) {
     for (std::size_t i = 0; i < presetNames.size(); ++i) {
         if (presetValues[i] != "NA") {
             SetCurrentCalibration(presetNames[i]);
-            SetPresetPower(ToFloat(TextToDouble(presetValues[i])));
+            SetPresetPower(ToFloat(platform::leadingDouble(presetValues[i])));
         }
     }
 
@@ -248,7 +249,8 @@ void CNAData::ReadSequence(const std::string& path) {
     auto maxPowers = file.Column(sensorBlock, "Max Power");
     auto minPowers = file.Column(sensorBlock, "Min Power");
     for (std::size_t i = 0; i < sensors.size(); ++i) {
-        m_sensorRanges[sensors[i]] = {TextToDouble(minPowers[i]), TextToDouble(maxPowers[i])};
+        m_sensorRanges[sensors[i]] = {platform::leadingDouble(minPowers[i]),
+                                      platform::leadingDouble(maxPowers[i])};
     }
 
     BuildBands(bandBlock, false);

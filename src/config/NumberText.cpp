@@ -1,24 +1,8 @@
 #include "config/NumberText.h"
 
 #include <cmath>
-#include <cstdlib>
 #include <limits>
 #include <sstream>
-
-double TextToDouble(const std::string& text) {
-    return std::strtod(text.c_str(), nullptr);
-}
-
-std::int32_t TextToInt(const std::string& text) {
-    long long value = std::strtoll(text.c_str(), nullptr, 10);
-    if (value > std::numeric_limits<std::int32_t>::max()) {
-        return std::numeric_limits<std::int32_t>::max();
-    }
-    if (value < std::numeric_limits<std::int32_t>::min()) {
-        return std::numeric_limits<std::int32_t>::min();
-    }
-    return static_cast<std::int32_t>(value);
-}
 
 float ToFloat(double value) {
     constexpr double kMax = std::numeric_limits<float>::max();

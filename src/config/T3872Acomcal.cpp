@@ -3,6 +3,7 @@
 #include "config/ConfigurationFile.h"
 #include "config/NumberText.h"
 #include "config/Split.h"
+#include "platform/NumberText.h"
 
 namespace {
 
@@ -35,11 +36,11 @@ void CT3872Acomcal::BuildBands(const CCSVTable& bandTable, bool lfe) {
             SetCurrentCalibration(name);
         }
         BandDefaults band;
-        band.m_startFreq = TextToDouble(starts[row]);
-        band.m_stopFreq = TextToDouble(stops[row]);
-        band.m_points = hasPoints ? TextToInt(points[row]) : defaultPoints;
+        band.m_startFreq = platform::leadingDouble(starts[row]);
+        band.m_stopFreq = platform::leadingDouble(stops[row]);
+        band.m_points = hasPoints ? platform::leadingInteger(points[row]) : defaultPoints;
         if (hasLimits) {
-            band.m_powerLimit = TextToDouble(limits[row]);
+            band.m_powerLimit = platform::leadingDouble(limits[row]);
         }
         // The engine spreads a band's points evenly from start to stop.
         if (band.m_points < 0 || band.m_points == 1) {
@@ -47,7 +48,7 @@ void CT3872Acomcal::BuildBands(const CCSVTable& bandTable, bool lfe) {
                 std::to_string(band.m_points) + " points in " + GetSourcePath() +
                 "; a band needs 0 or at least 2";
         }
-        bands[TextToInt(numbers[row])] = band;
+        bands[platform::leadingInteger(numbers[row])] = band;
     }
 }
 
@@ -71,8 +72,8 @@ void CT3872Acomcal::ReadSequence(const std::string& path) {
                     " in " + path + " needs two powers, start and stop, but reads \"" +
                     values[row] + "\"";
             }
-            SetConstant("teststartpower", TextToDouble(parts[0]));
-            SetConstant("teststoppower", TextToDouble(parts[1]));
+            SetConstant("teststartpower", platform::leadingDouble(parts[0]));
+            SetConstant("teststoppower", platform::leadingDouble(parts[1]));
         } else if (selection.find("Order") != std::string::npos) {
             SetOrder(parts);
         } else if (selection.find("Minband") != std::string::npos) {
@@ -80,7 +81,7 @@ void CT3872Acomcal::ReadSequence(const std::string& path) {
                 throw "The \"Order / Power\" row \"" + selection + "\" of model " + GetModel() +
                     " in " + path + " needs a band number";
             }
-            SetConstant("minband", TextToDouble(parts[0]));
+            SetConstant("minband", platform::leadingDouble(parts[0]));
         }
     }
 }

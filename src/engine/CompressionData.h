@@ -11,12 +11,13 @@
 #include <vector>
 
 #include "platform/OperatorUi.h"
+#include "storage/MeasuredResults.h"
 
 class CNAData;
 
 namespace engine {
 
-class CCompressionData {
+class CCompressionData final : public storage::MeasuredResults {
   public:
     // Unknown trace types are reported to the operator through ui.
     explicit CCompressionData(platform::OperatorUi& ui);
@@ -30,9 +31,9 @@ class CCompressionData {
     void clearMeasurements();
 
     void setNarrowbandLoss(float loss) { m_narrowbandLoss = loss; }
-    float getNarrowbandLoss() const { return m_narrowbandLoss; }
+    float getNarrowbandLoss() const override { return m_narrowbandLoss; }
     void setNarrowbandAtten(const std::string& atten) { m_narrowbandAtten = atten; }
-    const std::string& getNarrowbandAtten() const { return m_narrowbandAtten; }
+    const std::string& getNarrowbandAtten() const override { return m_narrowbandAtten; }
 
     // Raw export of every trace to directory/"RcvrChar_AllMeasuredData_<tag>.csv". A file that
     // cannot be opened is skipped: the export is a by-product of the run.
@@ -41,13 +42,13 @@ class CCompressionData {
 
     // Searches the power levels at frequency index f for compression level L dB.
     bool findCompressionPoint(float level, float tolerance, int f, bool first, int& startIndex,
-                              bool& stop);
-    float compressionPower() const { return m_compressionPower; }
-    float compressionValue() const { return m_compressionValue; }
-    float compressionPhase() const { return m_compressionPhase; }
-    void setCompressionValue(float value) { m_compressionValue = value; }
-    void setCompressionPhase(float phase) { m_compressionPhase = phase; }
-    void setCompressionPoint(float power, float value, float phase) {
+                              bool& stop) override;
+    float compressionPower() const override { return m_compressionPower; }
+    float compressionValue() const override { return m_compressionValue; }
+    float compressionPhase() const override { return m_compressionPhase; }
+    void setCompressionValue(float value) override { m_compressionValue = value; }
+    void setCompressionPhase(float phase) override { m_compressionPhase = phase; }
+    void setCompressionPoint(float power, float value, float phase) override {
         m_compressionPower = power;
         m_compressionValue = value;
         m_compressionPhase = phase;
@@ -59,15 +60,15 @@ class CCompressionData {
     const std::vector<double>& getBandIfbws() const { return m_bandIfbws; }
     const std::vector<double>& getBandRefPowers() const { return m_bandRefPowers; }
     const std::vector<double>& getBandPowerLimits() const { return m_bandPowerLimits; }
-    const std::vector<double>& getFrequencies() const { return m_frequencies; }
-    const std::vector<double>& getLowFrequencies() const { return m_lowFrequencies; }
+    const std::vector<double>& getFrequencies() const override { return m_frequencies; }
+    const std::vector<double>& getLowFrequencies() const override { return m_lowFrequencies; }
     const std::vector<double>& getPowerLevels() const { return m_powerLevels; }
     int getMinBand() const { return m_firstBand; }
     int getMaxBand() const { return m_lastBand; }
-    double getCalPowDelta() const { return m_calPowDelta; }
+    double getCalPowDelta() const override { return m_calPowDelta; }
     double getSpamClipPower() const { return m_spamClipPower; }
-    double getMaxMeasuredFrequency() const { return m_maxMeasuredFrequency; }
-    float getMinCompStepRatio() const { return m_minCompStepRatio; }
+    double getMaxMeasuredFrequency() const override { return m_maxMeasuredFrequency; }
+    float getMinCompStepRatio() const override { return m_minCompStepRatio; }
     int getPowerCount() const { return static_cast<int>(m_powerLevels.size()); }
     bool isLfe() const { return m_lfe; }
     bool isT3951() const { return m_t3951; }

@@ -6,7 +6,7 @@
 
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "engine/CompressionData.h"
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 
 namespace engine {
 
@@ -145,11 +145,11 @@ void checkConnection(SweepContext& context, const std::string& label, const std:
     }
     const float loss = narrowband - wideband;
     if (std::fabs(loss) > 10.0) {
-        const std::string text = "Receiver " + label +
-                                 " appears to have an issue with narrow band path " +
-                                 "\nThe expected difference (wideband - narrowband) is about -3 "
-                                 "+/- 2 dB\nThe loss measured is " +
-                                 generalText(loss) + "\nPress OK to continue or Cancel to Abort";
+        const std::string text =
+            "Receiver " + label + " appears to have an issue with narrow band path " +
+            "\nThe expected difference (wideband - narrowband) is about -3 "
+            "+/- 2 dB\nThe loss measured is " +
+            platform::generalText(loss) + "\nPress OK to continue or Cancel to Abort";
         if (context.ui.messageBox({text, "Narrow band IF filter path issue", Buttons::OkCancel,
                                    platform::BoxSystemModal | platform::BoxTopmost}) !=
             Answer::Ok) {
@@ -209,7 +209,7 @@ void checkPowerRatio(SweepContext& context, const std::string& model, long point
         }
         const std::string text =
             "Expected power ratio: " + std::to_string(instructions.expectedPad) + " +/- 5 dB\n" +
-            "Power ratio read: " + generalText(ratio) + "\n" +
+            "Power ratio read: " + platform::generalText(ratio) + "\n" +
             "Check connections, connection instructions were: \n\n" + instructions.text +
             "\n\nRetry? (no will continue)";
         if (context.ui.messageBox({text, "Unexpected power ratio reading", Buttons::YesNo,

@@ -2,7 +2,7 @@
 #include <memory>
 
 #include "engine/CompressionData.h"
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 
 namespace engine {
 
@@ -36,7 +36,7 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     }
     std::string text = "Freq";
     for (double power : m_powerLevels) {
-        const std::string p = generalText(power, 6);
+        const std::string p = platform::generalText(power, 6);
         text += ",Rec Pow(" + p + "),Mag(" + p + "),Phase(" + p + ")";
     }
     text += '\n';
@@ -46,14 +46,14 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     text.reserve(flushAt + 4096);
     const std::size_t rows = m_ratioMag.size();
     for (std::size_t j = 0; j < m_frequencies.size(); ++j) {
-        appendGeneral(text, m_frequencies[j], 15);
+        platform::appendGeneral(text, m_frequencies[j], 15);
         for (std::size_t i = 0; i < rows; ++i) {
             text += ',';
-            appendFloat8(text, readingAt(m_testMag, i, j));
+            platform::appendFloat8(text, readingAt(m_testMag, i, j));
             text += ',';
-            appendFloat8(text, readingAt(m_ratioMag, i, j));
+            platform::appendFloat8(text, readingAt(m_ratioMag, i, j));
             text += ',';
-            appendFloat8(text, readingAt(m_phase, i, j));
+            platform::appendFloat8(text, readingAt(m_phase, i, j));
         }
         text += '\n';
         if (text.size() >= flushAt) {

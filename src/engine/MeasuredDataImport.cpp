@@ -4,7 +4,7 @@
 #include <fstream>
 #include <string_view>
 
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 
 namespace engine {
 
@@ -75,7 +75,7 @@ void readAllMeasuredData(CCompressionData& store, const std::filesystem::path& f
                    " power levels of the ladder: " + line);
     }
     for (std::size_t i = 0; i < levels; ++i) {
-        const std::string expected = "Rec Pow(" + generalText(ladder[i]) + ")";
+        const std::string expected = "Rec Pow(" + platform::generalText(ladder[i]) + ")";
         if (cells[1 + 3 * i] != expected) {
             lines.fail("header column " + std::to_string(2 + 3 * i) + " is \"" +
                        std::string(cells[1 + 3 * i]) + "\", the ladder gives \"" + expected + "\"");
@@ -101,7 +101,7 @@ void readAllMeasuredData(CCompressionData& store, const std::filesystem::path& f
                        " the band plan measures");
         }
         planText.clear();
-        appendGeneral(planText, frequencies[row], 15);
+        platform::appendGeneral(planText, frequencies[row], 15);
         if (cells[0] != planText) {
             lines.fail("frequency " + std::string(cells[0]) + " differs from the band plan's " +
                        planText);

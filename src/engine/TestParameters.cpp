@@ -3,7 +3,7 @@
 #include <cmath>
 
 #include "config/NAData.h"
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 
 namespace engine {
 
@@ -14,8 +14,8 @@ constexpr double kMaxLadderLevels = 100000;
 
 std::string ladderText(const std::string& startKey, double start, const std::string& stopKey,
                        double stop, const std::string& stepKey, double step) {
-    return startKey + " " + generalText(start) + ", " + stopKey + " " + generalText(stop) + ", " +
-           stepKey + " " + generalText(step);
+    return startKey + " " + platform::generalText(start) + ", " + stopKey + " " +
+           platform::generalText(stop) + ", " + stepKey + " " + platform::generalText(step);
 }
 
 }  // namespace

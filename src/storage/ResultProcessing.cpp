@@ -7,7 +7,7 @@
 #include <memory>
 
 #include "engine/CompressionData.h"
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 #include "storage/FlashTransfer.h"
 #include "storage/ReceiverNames.h"
 
@@ -37,8 +37,8 @@ class RawResultWriter {
 
     bool on() const { return m_file != nullptr; }
     void text(std::string_view text) { m_text += text; }
-    void number(double value, int digits) { engine::appendGeneral(m_text, value, digits); }
-    void reading(float value) { engine::appendFloat8(m_text, value); }
+    void number(double value, int digits) { platform::appendGeneral(m_text, value, digits); }
+    void reading(float value) { platform::appendFloat8(m_text, value); }
     void endBlock() {
         if (m_text.size() >= kFlushAt) {
             flush();
@@ -57,12 +57,12 @@ class RawResultWriter {
     std::string m_text;
 };
 
-CompressionPoint searchOutputs(const engine::CCompressionData& store) {
+CompressionPoint searchOutputs(const MeasuredResults& store) {
     return {store.compressionPower(), store.compressionValue(), store.compressionPhase()};
 }
 
 // Settles the four levels at frequency index f; returns the index of the last level reached.
-int settleLevels(engine::CCompressionData& store, int f, bool rawOn, RecordPoints& points) {
+int settleLevels(MeasuredResults& store, int f, bool rawOn, RecordPoints& points) {
     int startIndex = -1;
     for (std::size_t k = 0; k < kCompressionLevels; ++k) {
         bool stop = false;
@@ -160,7 +160,7 @@ std::string rawResultFileName(const std::string& receiver) {
 namespace {
 
 // Builds the image and the raw result file; the raw file is closed on return.
-Judgement buildImage(engine::CCompressionData& store, const std::string& name, bool mmwave,
+Judgement buildImage(MeasuredResults& store, const std::string& name, bool mmwave,
                      const std::optional<std::filesystem::path>& rawFile) {
     const auto& frequencies = store.getFrequencies();
     const auto& low = store.getLowFrequencies();
@@ -219,7 +219,7 @@ Judgement buildImage(engine::CCompressionData& store, const std::string& name, b
 
 }  // namespace
 
-Judgement judgeResults(engine::CCompressionData& store, const std::string& receiver, bool mmwave,
+Judgement judgeResults(MeasuredResults& store, const std::string& receiver, bool mmwave,
                        const std::optional<std::filesystem::path>& rawFile,
                        platform::OperatorUi& ui) {
     const std::string name = shortReceiverName(receiver);
@@ -244,8 +244,8 @@ Judgement judgeResults(engine::CCompressionData& store, const std::string& recei
     return result;
 }
 
-bool processResults(StorageContext& context, engine::CCompressionData& store,
-                    const std::string& receiver, const std::string& /*searchMode*/, bool rawFile) {
+bool processResults(StorageContext& context, MeasuredResults& store, const std::string& receiver,
+                    const std::string& /*searchMode*/, bool rawFile) {
     const std::string name = shortReceiverName(receiver);
     std::optional<std::filesystem::path> rawPath;
     if (rawFile) {

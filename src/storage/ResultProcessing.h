@@ -9,12 +9,9 @@
 #include <string>
 
 #include "platform/OperatorUi.h"
+#include "storage/MeasuredResults.h"
 #include "storage/RcvrCharImage.h"
 #include "storage/StorageContext.h"
-
-namespace engine {
-class CCompressionData;
-}
 
 namespace storage {
 
@@ -31,7 +28,7 @@ struct Judgement {
 // text. Bad data asks ui.badDataChoice: Quit raises "User aborted characterization due to
 // bad data on receiver <name>", Continue shows the "Warning" box and zeroes the measured
 // records. Uses the store's search outputs as working state.
-Judgement judgeResults(engine::CCompressionData& store, const std::string& receiver, bool mmwave,
+Judgement judgeResults(MeasuredResults& store, const std::string& receiver, bool mmwave,
                        const std::optional<std::filesystem::path>& rawFile,
                        platform::OperatorUi& ui);
 
@@ -39,8 +36,8 @@ Judgement judgeResults(engine::CCompressionData& store, const std::string& recei
 // accepted image (per-port file on millimetre-wave systems, flash otherwise) and makes the
 // analyzer load it. Returns false when the operator chose to retest (nothing stored).
 // searchMode is not used.
-bool processResults(StorageContext& context, engine::CCompressionData& store,
-                    const std::string& receiver, const std::string& searchMode, bool rawFile);
+bool processResults(StorageContext& context, MeasuredResults& store, const std::string& receiver,
+                    const std::string& searchMode, bool rawFile);
 
 // ".\rcvrCharRaw_" + name + ".txt", as the file is named in the working directory.
 std::string rawResultFileName(const std::string& receiver);

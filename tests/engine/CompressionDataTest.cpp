@@ -6,8 +6,8 @@
 
 #include "TempDir.h"
 #include "engine/CompressionData.h"
-#include "engine/NumberText.h"
 #include "platform/ErrorText.h"
+#include "platform/NumberText.h"
 #include "platform/ScriptedOperatorUi.h"
 
 using engine::CCompressionData;
@@ -276,8 +276,8 @@ TEST(NumberText, FastFloatTextEqualsTheGeneralFormatter) {
     int mismatches = 0;
     for (float value : samples) {
         std::string fast, general;
-        engine::appendFloat8(fast, value);
-        engine::appendGeneral(general, value, 8);
+        platform::appendFloat8(fast, value);
+        platform::appendGeneral(general, value, 8);
         if (fast != general && ++mismatches < 10) {
             ADD_FAILURE() << general << " written as " << fast;
         }

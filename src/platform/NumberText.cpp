@@ -1,12 +1,14 @@
-#include "engine/NumberText.h"
+#include "platform/NumberText.h"
 
 #include <array>
 #include <bit>
 #include <charconv>
+#include <climits>
 #include <cmath>
 #include <cstdint>
+#include <cstdlib>
 
-namespace engine {
+namespace platform {
 
 void appendGeneral(std::string& out, double value, int significantDigits) {
     char buffer[64];
@@ -167,4 +169,19 @@ void appendFloat8(std::string& out, float value) {
     }
 }
 
-}  // namespace engine
+int leadingInteger(const std::string& text) {
+    long value = std::strtol(text.c_str(), nullptr, 10);
+    if (value > INT_MAX) {
+        return INT_MAX;
+    }
+    if (value < INT_MIN) {
+        return INT_MIN;
+    }
+    return static_cast<int>(value);
+}
+
+double leadingDouble(const std::string& text) {
+    return std::strtod(text.c_str(), nullptr);
+}
+
+}  // namespace platform

@@ -1,0 +1,22 @@
+#pragma once
+
+// Numbers in texts: written as a C++ stream writes them in its default notation with a given
+// precision (printf's %.Ng; the stream default is 6), appended without allocating; read back
+// with atoi/atof semantics (the valid leading part, or 0).
+
+#include <string>
+
+namespace platform {
+
+void appendGeneral(std::string& out, double value, int significantDigits);
+std::string generalText(double value, int significantDigits = 6);
+// appendGeneral(out, value, 8) for a float, without the general-purpose formatter's cost;
+// byte-identical to it.
+void appendFloat8(std::string& out, float value);
+
+// The leading integer of text, 0 when there is none; out-of-range values saturate.
+int leadingInteger(const std::string& text);
+// The leading decimal number of text, 0 when there is none.
+double leadingDouble(const std::string& text);
+
+}  // namespace platform
