@@ -25,8 +25,8 @@ struct AnalyzerOptions {
     std::string analyzer = "sim";
     // Empty: "analyzer-sim" in the working directory.
     std::string simState;
-    // "virtual" or "real".
-    std::string clock = "real";
+    // "virtual" (waits only counted, the default against the simulator) or "real".
+    std::string clock = "virtual";
     // Empty: no trace.
     std::string trace;
 };

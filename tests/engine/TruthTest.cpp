@@ -38,12 +38,9 @@ TEST(CharacterizationTruth, StoredCompressionLiesWithinOneLadderStepOfTheClosedF
     for (const auto& name : all) {
         EXPECT_EQ(sim.findings[name], 2) << name;
     }
-    // The simulator drives only the port that "SOUR:POW" names (port 1, as the channel's
-    // measurement is set up), so only port 1's receivers see the ladder.
-    const std::vector<std::string> receivers = {"R1", "A"};
     const double step = sim.config.GetConstant("testpowerstep");
     const float levels[4] = {0.05f, 0.1f, 0.2f, 0.5f};
-    for (const auto& name : receivers) {
+    for (const auto& name : all) {
         const auto& physics = sim.simulator->scenario().receiver(name);
         const auto records =
             rawRecords(testsupport::readFile(sim.workDir() / ("rcvrCharRaw_" + name + ".txt")));
