@@ -10,7 +10,9 @@ void ConsoleView::showReceivers(const std::vector<std::string>& names) {
 }
 
 void ConsoleView::showSelection(const std::vector<bool>& selected) {
-    const bool changed = selected != m_selected;
+    // The first selection comes with the list, which the loop shows with its help.
+    const bool changed = m_selectionShown && selected != m_selected;
+    m_selectionShown = true;
     m_selected = selected;
     if (m_interactive && changed) {
         m_output.write(listText());

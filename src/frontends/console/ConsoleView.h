@@ -52,6 +52,7 @@ class ConsoleView final : public app::DialogView {
     std::function<void(const std::string&)> m_hook;
     std::vector<std::string> m_names;
     std::vector<bool> m_selected;
+    bool m_selectionShown = false;
     bool m_runEnabled = true;
     bool m_abortEnabled = false;
     std::chrono::milliseconds m_period{1000};
