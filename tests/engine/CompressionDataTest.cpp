@@ -4,6 +4,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "ErrorOf.h"
 #include "TempDir.h"
 #include "engine/CompressionData.h"
 #include "platform/ErrorText.h"
@@ -14,14 +15,7 @@ using engine::CCompressionData;
 
 namespace {
 
-std::string errorOf(const std::function<void()>& action) {
-    try {
-        action();
-    } catch (...) {
-        return platform::currentErrorText();
-    }
-    return "nothing thrown";
-}
+using testsupport::errorOf;
 
 std::vector<std::string> lines(const std::string& text) {
     std::vector<std::string> result;

@@ -7,12 +7,15 @@
 #include <QtCharts/QValueAxis>
 #include <sstream>
 
+#include "ErrorOf.h"
 #include "QtTestApplication.h"
 #include "TempDir.h"
 #include "frontends/qt/CharacterizationChart.h"
 #include "frontends/qt/PlotRenderer.h"
 
 namespace {
+
+using testsupport::errorOf;
 
 using qtui::ChartView;
 using testsupport::readFile;
@@ -66,15 +69,6 @@ Axis* axisOf(QChart& chart, Qt::Alignment alignment) {
         }
     }
     return nullptr;
-}
-
-std::string errorOf(const std::function<void()>& action) {
-    try {
-        action();
-    } catch (const std::string& text) {
-        return text;
-    }
-    return "no error";
 }
 
 class CharacterizationPlot : public ::testing::Test {

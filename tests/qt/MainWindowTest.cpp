@@ -1,4 +1,3 @@
-#include "frontends/qt/QtKeywords.h"
 
 #include <gtest/gtest.h>
 

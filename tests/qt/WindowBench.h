@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // The desktop front end against the simulated analyzer in a fresh directory: the working
 // directory (with the sample "RcvrChar.dat") is the process's current directory while the
 // window runs.

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Plays the operator on the real widgets: answers every message box and bad-data dialog
 // that appears (by caption, from a script), and performs a list of steps, each once its
 // condition holds. Actions are posted, never run inside the polling timer, so a modal box

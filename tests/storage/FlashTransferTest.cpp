@@ -4,6 +4,7 @@
 #include <csignal>
 #include <functional>
 
+#include "ErrorOf.h"
 #include "SimBench.h"
 #include "platform/ErrorText.h"
 #include "storage/FlashTransfer.h"
@@ -13,6 +14,8 @@ using storage::RcvrCharImage;
 using storagetest::SimBench;
 
 namespace {
+
+using testsupport::errorOf;
 
 const std::string kConfigurations = "C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations\\";
 
@@ -24,15 +27,6 @@ RcvrCharImage imageOf(const std::string& receiver, std::uint32_t records) {
             {{{-10, -0.05f, -0.1f}, {-9, -0.1f, -0.2f}, {-8, -0.2f, -0.4f}, {-7, -0.5f, -1.0f}}});
     }
     return image;
-}
-
-std::string errorOf(const std::function<void()>& action) {
-    try {
-        action();
-    } catch (...) {
-        return platform::currentErrorText();
-    }
-    return "nothing thrown";
 }
 
 // Limits the size of files this process may write, as a full disk would, for one scope.

@@ -6,6 +6,7 @@
 #include <iomanip>
 #include <sstream>
 
+#include "ErrorOf.h"
 #include "platform/ErrorText.h"
 #include "storage/ExportText.h"
 #include "storage/RcvrCharImage.h"
@@ -17,14 +18,7 @@ using storage::RecordPoints;
 
 namespace {
 
-std::string errorOf(const std::function<void()>& action) {
-    try {
-        action();
-    } catch (...) {
-        return platform::currentErrorText();
-    }
-    return "nothing thrown";
-}
+using testsupport::errorOf;
 
 RecordPoints samplePoints() {
     return {{{-10.5f, -0.05f, -0.15f},

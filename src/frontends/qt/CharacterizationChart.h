@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Charts of one receiver's characterization: compression power or compression phase
 // against frequency, one line per compression level, band edges as grid lines of a
 // second frequency axis.

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // The plots beside the dialog: one entry per characterized receiver, with a view of the
 // compression power and one of the compression phase.
 

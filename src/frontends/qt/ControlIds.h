@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Every control carries its template id, so that tests and tools can find it by id.
 
 #include <QWidget>

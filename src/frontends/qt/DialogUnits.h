@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Dialog templates give positions in dialog units, which scale with the dialog's font:
 // four horizontal units per average character width, eight vertical units per line height.
 

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Draws a characterization chart into an SVG or PNG file without a display.
 
 #include <QSize>

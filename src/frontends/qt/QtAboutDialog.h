@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 #include <QDialog>
 
 #include "app/CAboutDlg.h"

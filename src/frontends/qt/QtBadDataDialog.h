@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // The bad-data dialog as a window: the prompt and the retest button are relabelled for the
 // receiver; the retest button shows its "Please Note" box, owned by this dialog, before the
 // dialog ends. Closing the window counts as "Don't retest".

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // Message boxes and the bad-data dialog as Qt windows. Construct on the UI thread.
 // On the UI thread a box is modal and returns the answer. From any other thread (the
 // worker) the box is shown on the UI thread without blocking it (the dialog, Abort

@@ -1,7 +1,5 @@
 #pragma once
 
-#include "frontends/qt/QtKeywords.h"
-
 // The "Receiver Characterization" dialog as a Qt window: the controls of its template at
 // their positions (dialog units scaled to the font), showing a CTarvexDlg and handing the
 // operator's actions to it. Handlers run guarded: an error text that escapes one ends the
