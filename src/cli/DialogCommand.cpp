@@ -11,6 +11,7 @@
 
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
+#include "cli/GuiCommand.h"
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "platform/RunSignals.h"
 #include "sim/SimulatedAnalyzer.h"
@@ -60,9 +61,13 @@ struct DialogOptions {
     std::string script;
     std::string answers;
     bool yes = false;
+    bool gui = false;
 };
 
 int runDialog(const DialogOptions& options) {
+    if (options.gui) {
+        return cli::runGuiDialog(options.analyzer);
+    }
     const bool scripted = !options.script.empty() || !::isatty(STDIN_FILENO);
     std::vector<console::ScriptLine> script;
     std::optional<console::AnswerBook> answers;
@@ -130,6 +135,9 @@ const cli::CommandRegistration registration{
         app.add_flag("--yes", options->yes,
                      "Answer every box with Yes or OK and the bad-data dialog with Continue")
             ->excludes(answers);
+        app.add_flag("--gui", options->gui,
+                     "Open the dialog in a desktop window instead of the terminal (needs a "
+                     "display), e.g. rcvrchar --gui --workdir bench");
         return [options] { return runDialog(*options); };
     }};
 

@@ -5,8 +5,6 @@
 #include <iostream>
 #include <memory>
 
-#include "cli/CommandRegistry.h"
-
 #if RCVRCHAR_WITH_QT
 #include "frontends/qt/QtDialogFrontEnd.h"
 #include "platform/RunSignals.h"
@@ -46,20 +44,5 @@ int runGuiDialog(const AnalyzerOptions& options) {
     return 1;
 #endif
 }
-
-namespace {
-
-const CommandRegistration registration{
-    "gui", [](CLI::App& app) -> std::function<int()> {
-        auto options = std::make_shared<AnalyzerOptions>();
-        options->clock = "virtual";
-        app.description(
-            "The Receiver Characterization dialog in a desktop window (needs a display: "
-            "DISPLAY, WAYLAND_DISPLAY or QT_QPA_PLATFORM)");
-        addAnalyzerOptions(app, *options);
-        return [options] { return runGuiDialog(*options); };
-    }};
-
-}  // namespace
 
 }  // namespace cli

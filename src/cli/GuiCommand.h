@@ -1,6 +1,6 @@
 #pragma once
 
-// The dialog in a desktop window, for the main command's --gui and the gui subcommand.
+// The dialog in a desktop window, for the main command's --gui.
 
 #include "cli/AnalyzerOptions.h"
 
