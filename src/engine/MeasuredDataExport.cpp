@@ -1,5 +1,6 @@
 #include <cstdio>
 #include <memory>
+#include <vector>
 
 #include "engine/CompressionData.h"
 #include "platform/NumberText.h"
@@ -16,13 +17,25 @@ struct FileCloser {
     void operator()(std::FILE* file) const { std::fclose(file); }
 };
 
-// A short row repeats its last reading; a missing row reads as 0.
-float readingAt(const CCompressionData::Table& table, std::size_t row, std::size_t column) {
-    if (row >= table.size() || table[row].empty()) {
-        return 0;
+// One row of a table as the export reads it: a short row repeats its last reading, a missing
+// or empty row reads as 0.
+struct RowReadings {
+    const float* values = nullptr;
+    std::size_t size = 0;
+
+    float at(std::size_t column) const {
+        if (column < size) {
+            return values[column];
+        }
+        return size == 0 ? 0.0f : values[size - 1];
     }
-    const auto& values = table[row];
-    return values[column < values.size() ? column : values.size() - 1];
+};
+
+RowReadings rowOf(const CCompressionData::Table& table, std::size_t row) {
+    if (row >= table.size()) {
+        return {};
+    }
+    return {table[row].data(), table[row].size()};
 }
 
 }  // namespace
@@ -34,34 +47,43 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     if (!file) {
         return;
     }
-    std::string text = "Freq";
+    std::string header = "Freq";
     for (double power : m_powerLevels) {
         const std::string p = platform::generalText(power, 6);
-        text += ",Rec Pow(" + p + "),Mag(" + p + "),Phase(" + p + ")";
+        header += ",Rec Pow(" + p + "),Mag(" + p + "),Phase(" + p + ")";
     }
-    text += '\n';
+    header += '\n';
+    std::fwrite(header.data(), 1, header.size(), file.get());
 
-    // Formatted in blocks so the buffer stays small whatever the data size.
-    constexpr std::size_t flushAt = 1 << 20;
-    text.reserve(flushAt + 4096);
     const std::size_t rows = m_ratioMag.size();
+    std::vector<RowReadings> readings;  // per level: test, ratio, phase
+    readings.reserve(3 * rows);
+    for (std::size_t i = 0; i < rows; ++i) {
+        readings.push_back(rowOf(m_testMag, i));
+        readings.push_back(rowOf(m_ratioMag, i));
+        readings.push_back(rowOf(m_phase, i));
+    }
+
+    // Rows are formatted straight into a block written out whenever it fills, so the memory
+    // stays bounded whatever the data size. A row never needs more than rowRoom bytes.
+    const std::size_t rowRoom = (readings.size() + 1) * (platform::kNumberRoom + 1) + 1;
+    constexpr std::size_t flushAt = 1 << 20;
+    std::vector<char> block(flushAt + rowRoom);
+    char* const begin = block.data();
+    char* at = begin;
     for (std::size_t j = 0; j < m_frequencies.size(); ++j) {
-        platform::appendGeneral(text, m_frequencies[j], 15);
-        for (std::size_t i = 0; i < rows; ++i) {
-            text += ',';
-            platform::appendFloat8(text, readingAt(m_testMag, i, j));
-            text += ',';
-            platform::appendFloat8(text, readingAt(m_ratioMag, i, j));
-            text += ',';
-            platform::appendFloat8(text, readingAt(m_phase, i, j));
+        at = platform::writeGeneral(at, m_frequencies[j], 15);
+        for (const RowReadings& row : readings) {
+            *at++ = ',';
+            at = platform::writeFloat8(at, row.at(j));
         }
-        text += '\n';
-        if (text.size() >= flushAt) {
-            std::fwrite(text.data(), 1, text.size(), file.get());
-            text.clear();
+        *at++ = '\n';
+        if (static_cast<std::size_t>(at - begin) >= flushAt) {
+            std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
+            at = begin;
         }
     }
-    std::fwrite(text.data(), 1, text.size(), file.get());
+    std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
 }
 
 }  // namespace engine

@@ -1,6 +1,5 @@
 #include <gtest/gtest.h>
 
-#include <cstring>
 #include <fstream>
 #include <sstream>
 
@@ -8,7 +7,6 @@
 #include "TempDir.h"
 #include "engine/CompressionData.h"
 #include "platform/ErrorText.h"
-#include "platform/NumberText.h"
 #include "platform/ScriptedOperatorUi.h"
 
 using engine::CCompressionData;
@@ -237,44 +235,4 @@ TEST(FindCompressionPoint, ShortRowsAreNeverReadPastTheirEnd) {
     EXPECT_TRUE(store.findCompressionPoint(0.05f, 0.006f, 1, true, start, stop));
     EXPECT_EQ(start, 0);
     EXPECT_FALSE(store.findCompressionPoint(0.05f, 0.006f, 5, true, start, stop));
-}
-
-TEST(NumberText, FastFloatTextEqualsTheGeneralFormatter) {
-    std::vector<float> samples = {1.0f,
-                                  -0.1f,
-                                  0.5f,
-                                  99999999.0f,
-                                  123456785.0f,
-                                  1e-5f,
-                                  1.2345678e-5f,
-                                  0.0001f,
-                                  9.9999999e-5f,
-                                  1e8f,
-                                  -30.123457f,
-                                  3.4028235e38f,
-                                  1.17549435e-38f,
-                                  1e-45f,
-                                  0.0f,
-                                  -0.0f,
-                                  12345678.0f,
-                                  0.125f,
-                                  99999995.0f};
-    std::uint32_t bits = 0x9E3779B9u;
-    for (int i = 0; i < 200000; ++i) {
-        bits = bits * 1664525u + 1013904223u;
-        float value;
-        std::memcpy(&value, &bits, sizeof value);
-        samples.push_back(value);
-        samples.push_back(static_cast<float>(static_cast<int>(bits % 200000) - 100000) / 1000.0f);
-    }
-    int mismatches = 0;
-    for (float value : samples) {
-        std::string fast, general;
-        platform::appendFloat8(fast, value);
-        platform::appendGeneral(general, value, 8);
-        if (fast != general && ++mismatches < 10) {
-            ADD_FAILURE() << general << " written as " << fast;
-        }
-    }
-    EXPECT_EQ(mismatches, 0);
 }
