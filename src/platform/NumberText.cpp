@@ -76,12 +76,16 @@ std::uint64_t eightDigitText(std::uint32_t d) {
     static_assert(std::endian::native == std::endian::little);
     std::uint64_t fixed = d * std::uint64_t{281474977} >> 16;
     std::uint64_t text = 0;
-    for (int pair = 0; pair < 4; ++pair) {
+    const auto takePair = [&](int pair) {
         std::uint16_t twoDigits;
         std::memcpy(&twoDigits, &kDigitPairs[2 * (fixed >> 32)], 2);
         text |= std::uint64_t{twoDigits} << (16 * pair);
         fixed = (fixed & 0xFFFFFFFF) * 100;
-    }
+    };
+    takePair(0);
+    takePair(1);
+    takePair(2);
+    takePair(3);
     return text;
 }
 
@@ -223,7 +227,9 @@ char* writeFloat8(char* out, float value) {
         ++exponent;
     }
     std::uint64_t digits = 0;
-    if (!scaledDigits(m, e, 7 - exponent, digits)) {
+    const int p = 7 - exponent;
+    const bool aligned = p >= 0 && p <= kMaxAlignedFivePower && alignedDigits(m, e, p, digits);
+    if (!aligned && !scaledDigits(m, e, p, digits)) {
         return writeGeneralFloat8(out, value);
     }
     if (digits > 100000000 || digits < 10000000) {
