@@ -4,11 +4,11 @@
 #include <algorithm>
 
 #include "analyzer/NetworkAnalyzerClass.h"
-#include "analyzer/UpperCase.h"
 #include "platform/NumberText.h"
+#include "platform/UpperCase.h"
 
-using analyzer::upperCased;
 using automation::queryInterface;
+using platform::upperCased;
 
 namespace {
 
@@ -111,7 +111,7 @@ void CNetworkAnalyzer::setsourcepower(double power, bool force) {
 }
 
 void CNetworkAnalyzer::setattenuator(const std::string& mode, int port) {
-    const std::string upper = upperCased(mode);
+    const std::string upper = platform::upperCased(mode);
     if (port > m_portCount || port < 1) {
         m_ui.messageBox({"I do not recognize port " + std::to_string(port), "",
                          platform::Buttons::Ok, platform::BoxNone});
@@ -193,9 +193,9 @@ void CNetworkAnalyzer::setsegments(const std::vector<double>& starts,
 void CNetworkAnalyzer::definemeasurement(std::string receiver, std::string port,
                                          const std::string& /*third*/, std::string fourth,
                                          bool force) {
-    receiver = upperCased(std::move(receiver));
-    port = upperCased(std::move(port));
-    fourth = upperCased(std::move(fourth));
+    receiver = platform::upperCased(std::move(receiver));
+    port = platform::upperCased(std::move(port));
+    fourth = platform::upperCased(std::move(fourth));
     if (receiver != m_measurementReceiver || port != m_measurementPort || force) {
         const std::string name = currentmeasurement()->name();
         sendscpi("CALC:PAR:DEL \"" + name + "\"");

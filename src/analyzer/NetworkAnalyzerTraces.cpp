@@ -5,10 +5,10 @@
 #include <string_view>
 
 #include "analyzer/NetworkAnalyzerClass.h"
-#include "analyzer/UpperCase.h"
+#include "platform/UpperCase.h"
 
-using analyzer::upperCased;
 using automation::queryInterface;
+using platform::upperCased;
 
 namespace {
 
@@ -98,7 +98,7 @@ long CNetworkAnalyzer::readtrace(automation::MeasurementData& data, const std::s
 
 long CNetworkAnalyzer::readdata(const std::string& name, const std::string& format,
                                 std::span<float> destination) {
-    const std::string upper = upperCased(format);
+    const std::string upper = platform::upperCased(format);
     formatCode(upper);
     const auto found = m_measurements.find(name);
     if (found == m_measurements.end()) {
@@ -110,7 +110,7 @@ long CNetworkAnalyzer::readdata(const std::string& name, const std::string& form
 }
 
 float CNetworkAnalyzer::readcurrentvalue(const std::string& format) {
-    const std::string upper = upperCased(format);
+    const std::string upper = platform::upperCased(format);
     formatCode(upper);
     const std::string name = currentmeasurement()->name();
     m_pCurrentMeasurementData =

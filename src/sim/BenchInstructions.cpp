@@ -1,4 +1,5 @@
 #include "sim/BenchInstructions.h"
+#include "platform/UpperCase.h"
 
 #include <regex>
 
@@ -13,11 +14,7 @@ std::optional<std::string> receiverInput(const std::string& line) {
     if (!std::regex_search(line, match, input)) {
         return std::nullopt;
     }
-    std::string name = match[1];
-    for (auto& c : name) {
-        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    }
-    return name;
+    return platform::upperCased(match[1]);
 }
 
 std::vector<std::string> linesOf(const std::string& text) {

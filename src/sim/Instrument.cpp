@@ -1,4 +1,5 @@
 #include "sim/Instrument.h"
+#include "platform/UpperCase.h"
 
 #include <algorithm>
 #include <cctype>
@@ -8,13 +9,6 @@
 
 namespace sim {
 namespace {
-
-std::string upper(std::string text) {
-    for (auto& c : text) {
-        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    }
-    return text;
-}
 
 // Degrees of phase error per dB of magnitude error for small noise.
 constexpr double phaseNoisePerDb = 6.6;
@@ -364,7 +358,7 @@ MeasurementState& Instrument::defineMeasurement(const std::string& name,
     MeasurementState m;
     m.name = name;
     m.parameter = parameter;
-    std::string what = upper(parameter.substr(0, parameter.find(',')));
+    std::string what = platform::upperCased(parameter.substr(0, parameter.find(',')));
     auto bad = [&] {
         return ScpiError{-224, "Illegal parameter value; unknown parameter \"" + parameter + "\""};
     };

@@ -7,17 +7,11 @@
 #include <ctime>
 #include <numeric>
 
+#include "platform/UpperCase.h"
 #include "sim/Instrument.h"
 
 namespace sim {
 namespace {
-
-std::string upper(std::string text) {
-    for (auto& c : text) {
-        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    }
-    return text;
-}
 
 bool startsWithNoCase(std::string_view text, std::string_view prefix) {
     if (text.size() < prefix.size()) {
@@ -145,7 +139,7 @@ void Instrument::buildCommands() {
             std::string text = c.parameters.string();
             std::string digits = parsePortText(text);
             if (digits.empty() || digits.size() > 2 ||
-                upper(text).find("PORT") == std::string::npos) {
+                platform::upperCased(text).find("PORT") == std::string::npos) {
                 throw ScpiError{-224, "Illegal parameter value; no source port \"" + text + "\""};
             }
             port = std::stoi(digits);
@@ -364,8 +358,8 @@ void Instrument::buildCommands() {
 
     // Receiver paths.
     t.add("SENSe#:PATH:CONFig:ELEMent:[STATe]", [this](C& c) {
-        std::string element = upper(c.parameters.string());
-        std::string value = upper(c.parameters.string());
+        std::string element = platform::upperCased(c.parameters.string());
+        std::string value = platform::upperCased(c.parameters.string());
         if (element.empty() || value.empty()) {
             throw ScpiError{-224, "Illegal parameter value; empty path element"};
         }
@@ -376,7 +370,7 @@ void Instrument::buildCommands() {
         return std::string();
     });
     t.add("SENSe#:PATH:CONFig:ELEMent:[STATe]?", [this](C& c) {
-        std::string element = upper(c.parameters.string());
+        std::string element = platform::upperCased(c.parameters.string());
         if (element.rfind("NBFATN", 0) == 0 && m_scenario.hasReceiver(element.substr(6))) {
             auto fault = m_scenario.faults.attenuatorReply.find(element.substr(6));
             return fault == m_scenario.faults.attenuatorReply.end() ? inQuotes("30")
@@ -401,7 +395,7 @@ void Instrument::buildCommands() {
     }
     t.add("DIAGnostic:SWEEP_PARM", [](C& c) {
         c.parameters.string();
-        std::string value = upper(c.parameters.string());
+        std::string value = platform::upperCased(c.parameters.string());
         if (value != "TRUE" && value != "FALSE") {
             throw ScpiError{-224, "Illegal parameter value; \"" + value + "\""};
         }

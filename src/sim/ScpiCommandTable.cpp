@@ -1,19 +1,10 @@
 #include "sim/ScpiCommandTable.h"
+#include "platform/UpperCase.h"
 
 #include <cctype>
 
 namespace sim {
-namespace {
-
-std::string upper(std::string_view text) {
-    std::string out(text);
-    for (auto& c : out) {
-        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    }
-    return out;
-}
-
-}  // namespace
+namespace {}  // namespace
 
 void ScpiCommandTable::add(std::string_view pattern, CommandHandler handler) {
     Entry entry;
@@ -40,7 +31,7 @@ void ScpiCommandTable::add(std::string_view pattern, CommandHandler handler) {
                 node.shortForm += c;
             }
         }
-        node.longForm = upper(text);
+        node.longForm = platform::upperCased(std::string(text));
         entry.nodes.push_back(node);
         if (colon == std::string_view::npos) {
             break;
@@ -60,7 +51,7 @@ bool ScpiCommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t 
     const Node& node = pattern[p];
     std::size_t mark = suffixes.size();
     if (i < input.size()) {
-        std::string keyword = upper(input[i]);
+        std::string keyword = platform::upperCased(std::string(input[i]));
         int suffix = 1;
         if (node.numbered) {
             std::size_t digits = keyword.size();

@@ -1,4 +1,5 @@
 #include "sim/ScpiSyntax.h"
+#include "platform/UpperCase.h"
 
 #include <cctype>
 #include <charconv>
@@ -9,14 +10,6 @@ namespace {
 
 bool isBlank(char c) {
     return c == ' ' || c == '\t' || c == '\r' || c == '\n';
-}
-
-std::string upper(std::string_view text) {
-    std::string out(text);
-    for (auto& c : out) {
-        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-    }
-    return out;
 }
 
 struct Suffix {
@@ -195,7 +188,7 @@ double ParameterReader::number() {
         rest.remove_prefix(1);
     }
     if (!rest.empty()) {
-        std::string unit = upper(rest);
+        std::string unit = platform::upperCased(std::string(rest));
         for (const auto& suffix : suffixes) {
             if (unit == suffix.text) {
                 return value * suffix.factor;
@@ -211,7 +204,7 @@ double ParameterReader::number() {
 
 bool ParameterReader::boolean() {
     std::string_view token = rawToken();
-    std::string text = upper(token);
+    std::string text = platform::upperCased(std::string(token));
     if (text == "ON" || text == "TRUE") {
         return true;
     }
@@ -232,7 +225,7 @@ std::string ParameterReader::word() {
     if (token.front() == '"' || token.front() == '\'') {
         throw ScpiError{-104, "Data type error; character data expected"};
     }
-    return upper(token);
+    return platform::upperCased(std::string(token));
 }
 
 bool ParameterReader::nextWord(std::uint16_t& word) {

@@ -1,9 +1,9 @@
-#include "analyzer/UpperCase.h"
+#include "platform/UpperCase.h"
 
 #include <algorithm>
 #include <cctype>
 
-namespace analyzer {
+namespace platform {
 
 std::string upperCased(std::string text) {
     std::transform(text.begin(), text.end(), text.begin(),
@@ -11,4 +11,4 @@ std::string upperCased(std::string text) {
     return text;
 }
 
-}  // namespace analyzer
+}  // namespace platform

@@ -2,9 +2,9 @@
 
 #include <string>
 
-namespace analyzer {
+namespace platform {
 
 // Each character as the standard toupper maps it in the "C" locale.
 std::string upperCased(std::string text);
 
-}  // namespace analyzer
+}  // namespace platform
