@@ -11,43 +11,40 @@ namespace {
 
 using simtest::SimFixture;
 
-std::string describe(const std::vector<sim::Instrument::Cable>& cables) {
-    std::string text;
-    for (const auto& c : cables) {
-        text +=
-            c.receiver + "@" + std::to_string(c.port) + "/" + std::to_string(int(c.padDb)) + ";";
-    }
-    return text;
-}
-
 TEST(BenchInstructions, ReadsEveryKindOfConnectionInstruction) {
-    EXPECT_EQ("R1@1/20;",
-              describe(sim::readConnectionInstructions(
-                  "Connect cable to PORT 1.\r\nConnect ** 20 ** pad to cable.\r\nConnect pad to "
-                  "\"RCVR R1 IN\"")));
-    EXPECT_EQ("R2@2/21;", describe(sim::readConnectionInstructions(
-                              "Connect cable to PORT 2.\r\nConnect one port of Lossy Delay Line "
-                              "40317-11012 to cable.\r\nConnect other port of Delay Line "
-                              "directly to \"RCVR R2 IN\"")));
-    EXPECT_EQ("C@3/0;", describe(sim::readConnectionInstructions(
-                            "Connect cable from PORT 3 to \"RCVR C IN\" (with no pad).")));
-    EXPECT_EQ("R1@1/10;A@1/6;",
-              describe(sim::readConnectionInstructions(
-                  "Remove front panel jumper from port \"RCVR R1 IN\".\r\nConnect 10 dB pad "
-                  "between \"RCVR R1 IN\" and \"SRC OUT\" connector.\r\nConnect cable to Port "
-                  "1.\r\n\r\nConnect 6dB pad to cable.\r\nRemove front panel jumper from port "
-                  "\"RCVR A IN\".\r\nConnect pad to \"RCVR A IN\".\r\n")));
-    EXPECT_EQ("D@4/0;", describe(sim::readConnectionInstructions(
-                            "Connect cable to Port 4.\r\n\r\nRemove front panel jumper from port "
-                            "\"RCVR D IN\".\r\nConnect other end of cable to \"RCVR D IN\".\r\n")));
-    EXPECT_EQ("", describe(sim::readConnectionInstructions("Please wait.")));
+    const std::pair<const char*, const char*> cases[] = {
+        {"Connect cable to PORT 1.\r\nConnect ** 20 ** pad to cable.\r\nConnect pad to "
+         "\"RCVR R1 IN\"",
+         "R1@1/20;"},
+        {"Connect cable to PORT 2.\r\nConnect one port of Lossy Delay Line 40317-11012 to "
+         "cable.\r\nConnect other port of Delay Line directly to \"RCVR R2 IN\"",
+         "R2@2/21;"},
+        {"Connect cable from PORT 3 to \"RCVR C IN\" (with no pad).", "C@3/0;"},
+        {"Remove front panel jumper from port \"RCVR R1 IN\".\r\nConnect 10 dB pad between "
+         "\"RCVR R1 IN\" and \"SRC OUT\" connector.\r\nConnect cable to Port 1.\r\n\r\nConnect "
+         "6dB pad to cable.\r\nRemove front panel jumper from port \"RCVR A IN\".\r\nConnect "
+         "pad to \"RCVR A IN\".\r\n",
+         "R1@1/10;A@1/6;"},
+        {"Connect cable to Port 4.\r\n\r\nRemove front panel jumper from port \"RCVR D "
+         "IN\".\r\nConnect other end of cable to \"RCVR D IN\".\r\n",
+         "D@4/0;"},
+        {"Please wait.", ""}};
+    for (const auto& [instruction, expected] : cases) {
+        std::string text;
+        for (const auto& c : sim::readConnectionInstructions(instruction)) {
+            text += c.receiver + "@" + std::to_string(c.port) + "/" + std::to_string(int(c.padDb)) +
+                    ";";
+        }
+        EXPECT_EQ(expected, text) << instruction;
+    }
     EXPECT_EQ("C", sim::receiverOfConnectionComplaint(
                        "Receiver C In does not seem to be connected to source Port 3\nPlease "
                        "check connection\nRetry? (no will continue)")
                        .value());
-    EXPECT_EQ("R3", sim::instrumentReceiver("R3 LOW FREQUENCY EXTENSION"));
-    EXPECT_EQ("R2", sim::instrumentReceiver("R2_LFE"));
-    EXPECT_EQ("B", sim::instrumentReceiver("B"));
+    for (const auto& [name, receiver] :
+         {std::pair{"R3 LOW FREQUENCY EXTENSION", "R3"}, {"R2_LFE", "R2"}, {"B", "B"}}) {
+        EXPECT_EQ(receiver, sim::instrumentReceiver(name));
+    }
 }
 
 // The connection check, the power-ratio check and a memory division, as the engine runs them.

@@ -76,12 +76,7 @@ TEST_F(Flash, CatalogListsDateFirstAndTheNameFourth) {
                          {"receiver": "A", "age_days": 10, "words": 500}]})");
     scpi(flashWrite("R1_LFE", {1, 2, 3}));
     std::string catalog = scpi("DIAG:FLASH:CAT?");
-    std::vector<std::string> lines;
-    for (std::size_t start = 0; start < catalog.size();) {
-        std::size_t end = catalog.find('\n', start);
-        lines.push_back(catalog.substr(start, end - start));
-        start = end == std::string::npos ? catalog.size() : end + 1;
-    }
+    auto lines = simtest::splitLines(catalog);
     ASSERT_EQ(3u, lines.size()) << catalog;
     auto a = fields(lines[0]);
     auto r1 = fields(lines[1]);
@@ -166,11 +161,8 @@ TEST_F(Flash, FlashSurvivesRestartAndTheNextRunButVolatileStateDoesNot) {
     EXPECT_EQ(std::string::npos, scpi("DIAG:FLASH:CAT?").find("RCVRCHAR\\B"));
 }
 
-TEST(FlashStore, LargeWriteParsesQuickly) {
-    testsupport::TempDir state;
-    sim::SimulatedAnalyzer analyzer(sim::Scenario{}, state.path());
-    auto app = automation::queryInterface<automation::Application>(analyzer.application());
-    auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+TEST_F(Flash, LargeWriteParsesQuickly) {
+    start();
     std::string command = "DIAG:FLASHARRAY \"RcvrChar\",\"A\"";
     const std::size_t words = 11 + 28 * 100000;
     command.reserve(words * 7 + 40);
@@ -178,14 +170,14 @@ TEST(FlashStore, LargeWriteParsesQuickly) {
         command += ", " + std::to_string(i % 65536);
     }
     auto begin = std::chrono::steady_clock::now();
-    parser->parse(command);
+    scpi(command);
     auto elapsed = std::chrono::steady_clock::now() - begin;
-    EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
+    EXPECT_EQ("0,\"No error\"", nextError());
     EXPECT_LT(std::chrono::duration_cast<std::chrono::milliseconds>(elapsed).count(), 2000);
-    std::string back = parser->parse("DIAG:flasharray? \"RCVRCHAR\",\"A\"");
+    std::string back = scpi("DIAG:flasharray? \"RCVRCHAR\",\"A\"");
     EXPECT_EQ(words, static_cast<std::size_t>(std::count(back.begin(), back.end(), ',')));
     // The transcript keeps the write abbreviated.
-    auto lines = analyzer.transcript();
+    auto lines = m_analyzer->transcript();
     ASSERT_GE(lines.size(), 2u);
     EXPECT_EQ(0u, lines[1].rfind("> DIAG:FLASHARRAY \"RcvrChar\",\"A\", 0, 1, 2", 0));
     EXPECT_NE(std::string::npos,
@@ -220,14 +212,10 @@ TEST_F(MillimetreWave, StoredCalibrationsArePerPortDataFilesListedByDir) {
     EXPECT_EQ(0, m_runner->runCommand("dir /-C \"" + path + "\" > fileInfo.txt"));
     std::string listing = testsupport::readFile(m_work / "fileInfo.txt");
     std::string line;
-    for (std::size_t start = 0; start < listing.size();) {
-        std::size_t end = listing.find('\n', start);
-        std::string candidate = listing.substr(start, end - start);
-        if (candidate.find("RcvrCharRef.dat") != std::string::npos) {
+    for (const auto& candidate : simtest::splitLines(listing)) {
+        if (line.empty() && candidate.find("RcvrCharRef.dat") != std::string::npos) {
             line = candidate;
-            break;
         }
-        start = end + 1;
     }
     auto f = fields(line);
     ASSERT_GE(f.size(), 5u) << listing;

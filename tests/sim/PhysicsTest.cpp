@@ -41,6 +41,19 @@ class Physics : public SimFixture {
         EXPECT_EQ("0,\"No error\"", nextError());
         return read("m", format);
     }
+    // CW sweeps of the given measurements ("name", "parameter") at the port's source power.
+    std::shared_ptr<automation::Channel> cw(
+        std::initializer_list<std::pair<const char*, const char*>> measurements, int port,
+        double dbm) {
+        scpi("CALC:PAR:DEL:ALL");
+        for (const auto& [name, parameter] : measurements) {
+            scpi(std::string("CALC:PAR:DEF:EXT \"") + name + "\",\"" + parameter + "\"");
+        }
+        auto ch = channel();
+        ch->setSweepType(3);
+        scpi("SOUR:POW " + std::to_string(dbm) + ",\"PORT " + std::to_string(port) + "\"");
+        return ch;
+    }
 };
 
 TEST_F(Physics, FinePowerSweepFindsEveryReceiversCompressionPointsAtTheClosedForm) {
@@ -87,13 +100,8 @@ TEST_F(Physics, RatioReadsPadPlusCompressionAndItsPhaseFollowsAmPm) {
 
 TEST_F(Physics, MemoryDivisionLeavesCompressionRelativeToTheReference) {
     start();
-    scpi("CALC:PAR:DEL:ALL");
-    scpi("CALC:PAR:DEF:EXT \"measmag\",\"A,1\"");
-    scpi("CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"");
-    auto ch = channel();
-    ch->setSweepType(3);
+    auto ch = cw({{"measmag", "A,1"}, {"measratio", "A/R1,1"}}, 1, -25.0);
     ch->setNumberOfPoints(5);
-    scpi("SOUR:POW -25,\"PORT 1\"");
     ch->singleSweep();
     scpi("CALC:PAR:SEL \"measratio\"");
     scpi("CALC:math:mem");
@@ -135,12 +143,10 @@ TEST_F(Physics, SegmentSweepUsesSegmentPowersAndCountsSegmentPoints) {
     EXPECT_NEAR(-2.0 + sim::compressionDb(c, -2.0), trace[6], 1e-5);
     // Without per-segment power the port's source power applies.
     m_app->reset();
-    scpi("CALC:PAR:DEL:ALL");
-    scpi("CALC:PAR:DEF:EXT \"measmag\",\"C,3\"");
+    cw({{"measmag", "C,3"}}, 3, -12.0);
     table = automation::queryInterface<automation::SegmentTable>(channel()->segmentTable());
     table->writeTable({{1, 2, 1e9, 2e9, 1000, 0, -20}});
     channel()->setSweepType(4);
-    scpi("SOUR:POW -12,\"PORT 3\"");
     channel()->singleSweep();
     EXPECT_NEAR(-12.0 + sim::compressionDb(c, -12.0), read("measmag")[1], 1e-5);
     EXPECT_THROW(table->writeTable({{1, 0, 1e9, 2e9, 1000, 0, 0}}), std::string);
@@ -149,11 +155,7 @@ TEST_F(Physics, SegmentSweepUsesSegmentPowersAndCountsSegmentPoints) {
 
 TEST_F(Physics, NarrowbandPathReadsThreeDbBelowWideband) {
     start();
-    scpi("CALC:PAR:DEL:ALL");
-    scpi("CALC:PAR:DEF:EXT \"measmag\",\"R2,2\"");
-    auto ch = channel();
-    ch->setSweepType(3);
-    scpi("SOUR:POW -10,\"PORT 2\"");
+    auto ch = cw({{"measmag", "R2,2"}}, 2, -10.0);
     ch->singleSweep();
     float wide = read("measmag")[0];
     scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"NBF\"");
@@ -166,12 +168,8 @@ TEST_F(Physics, NarrowbandPathReadsThreeDbBelowWideband) {
 
 TEST_F(Physics, NoiseIsAveragedDownAndMeanStatisticReadsTheTrace) {
     start(R"({"receivers": {"*": {"noise_db": 0.2}}})");
-    scpi("CALC:PAR:DEL:ALL");
-    scpi("CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"");
-    auto ch = channel();
-    ch->setSweepType(3);
+    auto ch = cw({{"measratio", "A/R1,1"}}, 1, -40.0);
     ch->setNumberOfPoints(2000);
-    scpi("SOUR:POW -40,\"PORT 1\"");
     auto spread = [&] {
         auto trace = read("measratio");
         double sum = 0.0;
@@ -198,12 +196,7 @@ TEST_F(Physics, NoiseIsAveragedDownAndMeanStatisticReadsTheTrace) {
 TEST_F(Physics, UnconnectedReceiverReadsTheNoiseFloorWhateverTheSource) {
     start();
     m_analyzer->instrument().cableReceivers({{"A", 1, 0.0}});
-    scpi("CALC:PAR:DEL:ALL");
-    scpi("CALC:PAR:DEF:EXT \"measmag\",\"A,2\"");  // port 2 is not cabled to A
-    auto ch = channel();
-    ch->setSweepType(3);
-    scpi("SOUR:POW 0,\"PORT 2\"");
-    ch->singleSweep();
+    cw({{"measmag", "A,2"}}, 2, 0.0)->singleSweep();  // port 2 is not cabled to A
     EXPECT_FLOAT_EQ(static_cast<float>(sim::Instrument::noiseFloorDbm), read("measmag")[0]);
 }
 

@@ -210,23 +210,19 @@ TEST_F(Scpi, MeasurementDefinitionsAreChecked) {
 }
 
 TEST_F(Scpi, ScenarioErrorRulesFireAfterMatchingCommandsOnly) {
-    testsupport::TempDir other;
-    sim::SimulatedAnalyzer analyzer(
-        sim::Scenario::fromJson(R"({"faults": {"scpi_errors": [{"command": "DIAG:FCAL",
-            "errors": ["-200,\"Execution error\"", "-310,\"System error\""], "times": 2}]}})"),
-        other.path());
-    auto app = automation::queryInterface<automation::Application>(analyzer.application());
-    auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
-    parser->parse("DIAG:EEUPDATEHW");
-    EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
+    m_analyzer.reset();
+    start(R"({"faults": {"scpi_errors": [{"command": "DIAG:FCAL",
+        "errors": ["-200,\"Execution error\"", "-310,\"System error\""], "times": 2}]}})");
+    scpi("DIAG:EEUPDATEHW");
+    EXPECT_EQ("0,\"No error\"", nextError());
     for (int i = 0; i < 3; ++i) {
-        parser->parse("diag:fcal:load");
+        scpi("diag:fcal:load");
     }
     for (int i = 0; i < 2; ++i) {
-        EXPECT_EQ("-200,\"Execution error\"", parser->parse("SYST:ERR?"));
-        EXPECT_EQ("-310,\"System error\"", parser->parse("SYST:ERR?"));
+        EXPECT_EQ("-200,\"Execution error\"", nextError());
+        EXPECT_EQ("-310,\"System error\"", nextError());
     }
-    EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
+    EXPECT_EQ("0,\"No error\"", nextError());
 }
 
 TEST_F(Scpi, TranscriptRecordsCommandsRepliesErrorsAndCalls) {

@@ -4,12 +4,24 @@
 
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "TempDir.h"
 #include "analyzer/automation/Automation.h"
 #include "sim/SimulatedAnalyzer.h"
 
 namespace simtest {
+
+// The lines of a reply or listing, without their line breaks.
+inline std::vector<std::string> splitLines(const std::string& text) {
+    std::vector<std::string> lines;
+    for (std::size_t start = 0; start < text.size();) {
+        std::size_t end = text.find('\n', start);
+        lines.push_back(text.substr(start, end - start));
+        start = end == std::string::npos ? text.size() : end + 1;
+    }
+    return lines;
+}
 
 // One simulated analyzer in a fresh state directory, with its parser at hand.
 class SimFixture : public ::testing::Test {

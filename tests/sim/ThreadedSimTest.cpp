@@ -18,10 +18,13 @@ TEST(ThreadedSimulatedAnalyzer, ConcurrentUsersSeeConsistentState) {
     ui.answerAll(platform::Answer::Ok);
     sim::SimulatedBench bench(ui, analyzer);
     std::atomic<bool> failed{false};
+    auto parserOf = [](const std::shared_ptr<automation::Application>& app) {
+        return automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+    };
 
     std::thread worker([&] {
         auto app = automation::queryInterface<automation::Application>(analyzer.application());
-        auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+        auto parser = parserOf(app);
         auto channel = automation::queryInterface<automation::Channel>(app->activeChannel());
         parser->parse("CALC:PAR:DEL:ALL");
         parser->parse("CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"");
@@ -37,8 +40,8 @@ TEST(ThreadedSimulatedAnalyzer, ConcurrentUsersSeeConsistentState) {
         }
     });
     std::thread dialog([&] {
-        auto app = automation::queryInterface<automation::Application>(analyzer.application());
-        auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+        auto parser =
+            parserOf(automation::queryInterface<automation::Application>(analyzer.application()));
         for (int i = 0; i < 200; ++i) {
             if (parser->parse("diag:portcount?") != "4") {
                 failed = true;
@@ -57,8 +60,8 @@ TEST(ThreadedSimulatedAnalyzer, ConcurrentUsersSeeConsistentState) {
     dialog.join();
     operatorHands.join();
     EXPECT_FALSE(failed);
-    auto app = automation::queryInterface<automation::Application>(analyzer.application());
-    auto parser = automation::queryInterface<automation::ScpiParser>(app->scpiParser());
+    auto parser =
+        parserOf(automation::queryInterface<automation::Application>(analyzer.application()));
     EXPECT_EQ(",1,2,199", parser->parse("DIAG:flasharray? \"RCVRCHAR\",\"B\""));
     EXPECT_EQ("0,\"No error\"", parser->parse("SYST:ERR?"));
 }
