@@ -2,49 +2,50 @@
 
 #include <sstream>
 
+#include "ConfigTestFiles.h"
 #include "config/CSVExtra.h"
 #include "config/OptionReply.h"
 #include "config/Split.h"
 
 namespace {
 
-std::string choose(const std::vector<std::string>& installed,
-                   const std::vector<std::string>& headings) {
-    CCSVExtra csv;
-    csv.SetSelection(installed, "T3872A");
-    return csv.ChooseCandidate(headings);
-}
-
-TEST(OptionRules, LastQualifyingHeadingWins) {
-    const std::vector<std::string> headings{"T3872", "T3872 AOPT=010", "T3872 AOPT=080"};
-    EXPECT_EQ(choose({"080"}, headings), "T3872 AOPT=080");
-    EXPECT_EQ(choose({"010"}, headings), "T3872 AOPT=010");
-    EXPECT_EQ(choose({"010", "080"}, headings), "T3872 AOPT=080");
-    EXPECT_EQ(choose({"029"}, headings), "T3872");
-    EXPECT_EQ(choose({"080"}, {"T3872 AOPT=080", "T3872"}), "T3872");
-}
-
-TEST(OptionRules, AnyOptionWithExclusions) {
-    EXPECT_EQ(choose({"010"}, {"T3872 AOPT= 010 080 !029"}), "T3872 AOPT= 010 080 !029");
-    EXPECT_EQ(choose({"010", "029"}, {"T3872 AOPT= 010 080 !029"}), "");
-    // Only exclusions: qualifies unless an excluded option is installed.
-    EXPECT_EQ(choose({"010"}, {"T3872 AOPT= !029"}), "T3872 AOPT= !029");
-    EXPECT_EQ(choose({"029"}, {"T3872 AOPT= !029 030"}), "");
-    // Neither options nor exclusions: never.
-    EXPECT_EQ(choose({"010"}, {"T3872 AOPT="}), "");
-    // Words compare whole: 01 is not 010.
-    EXPECT_EQ(choose({"01"}, {"T3872 AOPT=010"}), "");
-}
-
-TEST(OptionRules, OnlyTheseOptions) {
-    const std::string heading = "T3872 OOPT= 010 080";
-    EXPECT_EQ(choose({"010", "080"}, {heading}), heading);
-    EXPECT_EQ(choose({"080", "010"}, {heading}), heading);
-    EXPECT_EQ(choose({"010", "080", "029"}, {heading}), "");
-    EXPECT_EQ(choose({"010"}, {heading}), "");
-    // Lower-case codes never match upper-cased headings.
-    EXPECT_EQ(choose({"1ce"}, {"T3872 OOPT=1CE"}), "");
-    EXPECT_EQ(choose({"1CE"}, {"T3872 OOPT=1CE"}), "T3872 OOPT=1CE");
+TEST(OptionRules, ChooseLastQualifyingHeading) {
+    using Texts = std::vector<std::string>;
+    const Texts plainAnd010And080{"T3872", "T3872 AOPT=010", "T3872 AOPT=080"};
+    const Texts anyOf{"T3872 AOPT= 010 080 !029"};
+    const Texts onlyThese{"T3872 OOPT= 010 080"};
+    struct Case {
+        Texts installed;
+        Texts headings;
+        std::string chosen;
+    };
+    const Case cases[] = {
+        {{"080"}, plainAnd010And080, "T3872 AOPT=080"},
+        {{"010"}, plainAnd010And080, "T3872 AOPT=010"},
+        {{"010", "080"}, plainAnd010And080, "T3872 AOPT=080"},
+        {{"029"}, plainAnd010And080, "T3872"},
+        {{"080"}, {"T3872 AOPT=080", "T3872"}, "T3872"},
+        // Any listed option, unless an excluded one is installed.
+        {{"010"}, anyOf, anyOf[0]},
+        {{"010", "029"}, anyOf, ""},
+        {{"010"}, {"T3872 AOPT= !029"}, "T3872 AOPT= !029"},
+        {{"029"}, {"T3872 AOPT= !029 030"}, ""},
+        {{"010"}, {"T3872 AOPT="}, ""},
+        {{"01"}, {"T3872 AOPT=010"}, ""},  // words compare whole
+        // Exactly the listed options, in any order.
+        {{"010", "080"}, onlyThese, onlyThese[0]},
+        {{"080", "010"}, onlyThese, onlyThese[0]},
+        {{"010", "080", "029"}, onlyThese, ""},
+        {{"010"}, onlyThese, ""},
+        {{"1ce"}, {"T3872 OOPT=1CE"}, ""},  // lower-case codes never match upper-cased headings
+        {{"1CE"}, {"T3872 OOPT=1CE"}, "T3872 OOPT=1CE"},
+    };
+    for (const Case& c : cases) {
+        CCSVExtra csv;
+        csv.SetSelection(c.installed, "T3872A");
+        EXPECT_EQ(csv.ChooseCandidate(c.headings), c.chosen)
+            << c.headings.front() << " with " << c.installed.front();
+    }
 }
 
 class Selection : public ::testing::Test {
@@ -75,34 +76,21 @@ TEST_F(Selection, SelectColumnGivesIndexInBlock) {
     EXPECT_EQ(m_csv.SelectColumn("Preset Powers", {"other"}), 4);
 }
 
-TEST_F(Selection, NoQualifyingHeadingNamesThePartials) {
+TEST_F(Selection, RowsAndColumnsWithoutCandidatesNameThePartials) {
+    using configtest::errorText;
     m_csv.SetSelection({"010"}, "T3872A");
-    try {
-        m_csv.SelectColumn("Preset Powers", {"T3999"});
-        FAIL() << "selection without candidates";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Column was not found, Partials searched forT3999 and that's it!");
-    }
-    try {
-        m_csv.FindSelection(*m_block, {"T3872", "AOPT"}, true, true);
-        FAIL() << "unqualified option column chosen";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Column was not found, Partials searched forT3872 andAOPT and that's it!");
-    }
+    EXPECT_EQ(errorText([&] { m_csv.SelectColumn("Preset Powers", {"T3999"}); }),
+              "Column was not found, Partials searched forT3999 and that's it!");
+    // An option column whose options are not installed is no candidate.
+    EXPECT_EQ(errorText([&] {
+                  m_csv.FindSelection(*m_block, {"T3872", "AOPT"}, true, true);
+              }),
+              "Column was not found, Partials searched forT3872 andAOPT and that's it!");
     EXPECT_EQ(m_csv.FindSelection(*m_block, {"T3999"}, false, false), "");
     m_block->SetHeaderFlag(false);
-    try {
-        m_csv.FindSelection(*m_block, {"Nothing"}, false, true);
-        FAIL() << "row selection without candidates";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Row was not found, Partials searched forNothing and that's it!");
-    }
-}
-
-TEST_F(Selection, RowSelectionUsesFirstCells) {
-    m_csv.SetSelection({"010"}, "T3872A");
-    m_block->SetHeaderFlag(false);
     EXPECT_EQ(m_csv.FindSelection(*m_block, {"preset"}, false, true), "Preset Powers");
+    EXPECT_EQ(errorText([&] { m_csv.FindSelection(*m_block, {"Nothing"}, false, true); }),
+              "Row was not found, Partials searched forNothing and that's it!");
 }
 
 TEST(SplitText, DelimiterRunsCountAsOne) {

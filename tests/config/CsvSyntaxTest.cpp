@@ -27,37 +27,36 @@ std::vector<std::vector<std::string>> readRows(const std::string& text, bool ski
 
 using Rows = std::vector<std::vector<std::string>>;
 
-TEST(CsvSyntax, QuotesProtectCommasAndLineFeeds) {
-    EXPECT_EQ(readRows("a,\"b,c\",d\n"), (Rows{{"a", "b,c", "d"}}));
-    EXPECT_EQ(readRows("a,\"line one\nline two\",z\n"), (Rows{{"a", "line one\nline two", "z"}}));
-}
-
-TEST(CsvSyntax, DoubledQuotesGiveOneQuote) {
-    EXPECT_EQ(readRows("\"say \"\"hi\"\"\"\n"), (Rows{{"say \"hi\""}}));
-    EXPECT_EQ(readRows("\"\",x\n"), (Rows{{"", "x"}}));
-    // Quotes in the middle of a cell only switch comma handling.
-    EXPECT_EQ(readRows("ab\"c,d\"e,f\n"), (Rows{{"abc,de", "f"}}));
-}
-
-TEST(CsvSyntax, EmptyCellsAndLines) {
-    EXPECT_EQ(readRows("a,b,\n"), (Rows{{"a", "b", ""}}));
-    EXPECT_EQ(readRows("a\n\nb\n"), (Rows{{"a"}, {""}, {"b"}}));
-    EXPECT_EQ(readRows(",,\n"), (Rows{{"", "", ""}}));
-    EXPECT_EQ(readRows("a\n\nb\n", true), (Rows{{"a"}, {"b"}}));
-}
-
-TEST(CsvSyntax, LineEnds) {
-    EXPECT_EQ(readRows("a,b\r\nc\r\n"), (Rows{{"a", "b"}, {"c"}}));
-    EXPECT_EQ(readRows("a,b\nc"), (Rows{{"a", "b"}, {"c"}}));
-    EXPECT_EQ(readRows("a\n"), (Rows{{"a"}}));
-    // A carriage return not followed by a line feed is an ordinary character.
-    EXPECT_EQ(readRows("a\rb\n"), (Rows{{"a\rb"}}));
-    EXPECT_EQ(readRows("\"x\r\ny\"\r\n"), (Rows{{"x\ny"}}));
-    EXPECT_TRUE(readRows("").empty());
-}
-
-TEST(CsvSyntax, TextIsKeptExactly) {
-    EXPECT_EQ(readRows("  Mixed Case , x \n"), (Rows{{"  Mixed Case ", " x "}}));
+TEST(CsvSyntax, CellsQuotesAndLineEnds) {
+    struct Case {
+        std::string text;
+        Rows rows;
+        bool skipBlank = false;
+    };
+    const Case cases[] = {
+        // Quotes protect commas and line feeds; doubled quotes give one quote.
+        {"a,\"b,c\",d\n", {{"a", "b,c", "d"}}},
+        {"a,\"line one\nline two\",z\n", {{"a", "line one\nline two", "z"}}},
+        {"\"say \"\"hi\"\"\"\n", {{"say \"hi\""}}},
+        {"\"\",x\n", {{"", "x"}}},
+        // Quotes in the middle of a cell only switch comma handling.
+        {"ab\"c,d\"e,f\n", {{"abc,de", "f"}}},
+        {"a,b,\n", {{"a", "b", ""}}},
+        {"a\n\nb\n", {{"a"}, {""}, {"b"}}},
+        {",,\n", {{"", "", ""}}},
+        {"a\n\nb\n", {{"a"}, {"b"}}, true},
+        {"a,b\r\nc\r\n", {{"a", "b"}, {"c"}}},
+        {"a,b\nc", {{"a", "b"}, {"c"}}},
+        {"a\n", {{"a"}}},
+        // A carriage return not followed by a line feed is an ordinary character.
+        {"a\rb\n", {{"a\rb"}}},
+        {"\"x\r\ny\"\r\n", {{"x\ny"}}},
+        {"", {}},
+        {"  Mixed Case , x \n", {{"  Mixed Case ", " x "}}},  // text is kept exactly
+    };
+    for (const Case& c : cases) {
+        EXPECT_EQ(readRows(c.text, c.skipBlank), c.rows) << c.text;
+    }
 }
 
 std::string quoteCell(const std::string& text) {

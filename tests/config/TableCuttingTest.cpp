@@ -2,9 +2,12 @@
 
 #include <sstream>
 
+#include "ConfigTestFiles.h"
 #include "config/CSVContainer.h"
 
 namespace {
+
+using configtest::errorText;
 
 // A container read from text with the header flag off, as the configuration readers use it.
 class TableCutting : public ::testing::Test {
@@ -49,47 +52,51 @@ TEST_F(TableCutting, ModelTableRunsToFirstEmptyRow) {
     EXPECT_EQ(column(*table, "t3872a").back(), "");
 }
 
-TEST_F(TableCutting, TableEndsAtRowEmptyWithinItsColumns) {
-    load("x,y\nTab,H1\n1,2\n,,beyond\n3,4\n");
-    CCSVTable* table = m_csv.CreateTable("Tab", false);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->RowCount(), 1U);
-    EXPECT_EQ(table->GetCell(0, 1), "2");
-}
-
-TEST_F(TableCutting, CellsBeyondColumnEndAreCut) {
-    load("Tab,H1,,H3\n1,2,3,4\n");
-    CCSVTable* table = m_csv.CreateTable("Tab", true);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->GetColumnEnd(), 2);
-    EXPECT_EQ(table->GetCell(0, 2), "");
-    EXPECT_EQ(table->GetCell(0, 1), "2");
-}
-
-TEST_F(TableCutting, FirstColumnOnlyTakesLowestRowNamingIt) {
-    load("T3872A,old\nv,1\n\nnote,T3872A\n\nT3872A,new\nw,2\n");
-    CCSVTable* table = m_csv.CreateTable("T3872A", true);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->GetFirstRow(), 5);
-    EXPECT_EQ(table->GetCell(0, 0), "w");
-}
-
-TEST_F(TableCutting, AnyColumnSearchStartsAtFirstHit) {
+TEST_F(TableCutting, TableShapes) {
+    struct Case {
+        const char* text;
+        const char* name;
+        bool firstColumnOnly;
+        int firstRow, firstColumn, columnEnd;  // -1: not checked
+        std::size_t rows;
+        int cellColumn;  // of data row 0
+        const char* cell;
+    };
+    const Case cases[] = {
+        // Ends at the first row empty within its columns, whatever lies beyond.
+        {"x,y\nTab,H1\n1,2\n,,beyond\n3,4\n", "Tab", false, -1, -1, -1, 1, 1, "2"},
+        // Cells beyond the column end are cut.
+        {"Tab,H1,,H3\n1,2,3,4\n", "Tab", true, -1, -1, 2, 1, 2, ""},
+        // The first column only takes the lowest row naming the table.
+        {"T3872A,old\nv,1\n\nnote,T3872A\n\nT3872A,new\nw,2\n", "T3872A", true, 5, -1, -1, 1, 0,
+         "w"},
+        // Any column: the search starts at the first hit.
+        {"a,b\nz,Grid,H\n,1,2\n", "grid", false, -1, 1, 3, 1, 1, "2"},
+        // Starting right of an empty cell gives no rows.
+        {"a,,Grid,H\n,,1,2\n", "Grid", false, -1, -1, -1, 0, 0, ""},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.text);
+        CCSVContainer csv;
+        std::istringstream in(c.text);
+        ASSERT_TRUE(csv.Load(in, false));
+        csv.SetHeaderFlag(false);
+        CCSVTable* table = csv.CreateTable(c.name, c.firstColumnOnly);
+        ASSERT_NE(table, nullptr);
+        for (auto [actual, expected] : {std::pair{table->GetFirstRow(), c.firstRow},
+                                        {table->GetFirstColumn(), c.firstColumn},
+                                        {table->GetColumnEnd(), c.columnEnd}}) {
+            EXPECT_TRUE(expected < 0 || actual == expected) << actual << " for " << expected;
+        }
+        EXPECT_EQ(table->RowCount(), c.rows);
+        if (c.rows == 0) {
+            EXPECT_EQ(table->TotalRows(), 0U);  // not even a heading row
+        }
+        EXPECT_EQ(table->GetCell(0, c.cellColumn), c.cell);
+    }
+    // The heading row comes from the found cell on.
     load("a,b\nz,Grid,H\n,1,2\n");
-    CCSVTable* table = m_csv.CreateTable("grid", false);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->GetFirstColumn(), 1);
-    EXPECT_EQ(table->GetColumnEnd(), 3);
-    EXPECT_EQ(table->GetHeader().GetText(1), "H");
-    EXPECT_EQ(table->GetCell(0, 1), "2");
-}
-
-TEST_F(TableCutting, StartRightOfAnEmptyCellGivesNoRows) {
-    load("a,,Grid,H\n,,1,2\n");
-    CCSVTable* table = m_csv.CreateTable("Grid", false);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->RowCount(), 0U);
-    EXPECT_EQ(table->TotalRows(), 0U);
+    EXPECT_EQ(m_csv.CreateTable("grid", false)->GetHeader().GetText(1), "H");
 }
 
 TEST_F(TableCutting, MissingTableIsNoError) {
@@ -101,25 +108,12 @@ TEST_F(TableCutting, MissingTableIsNoError) {
 TEST_F(TableCutting, DuplicateAndMissingParentAreErrors) {
     load(kTwoModels);
     ASSERT_NE(m_csv.CreateTable("T3872A", true), nullptr);
-    try {
-        m_csv.CreateTable("T3872", true);
-        FAIL() << "duplicate accepted";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Table already exists!: T3872");
-    }
+    EXPECT_EQ(errorText([&] { m_csv.CreateTable("T3872", true); }), "Table already exists!: T3872");
     ASSERT_NE(m_csv.CreateSubTable("T3872A", "Banded"), nullptr);
-    try {
-        m_csv.CreateSubTable("T3872A", "banded");
-        FAIL() << "duplicate block accepted";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Table already exists!: banded");
-    }
-    try {
-        m_csv.CreateSubTable("T3999A", "Preset Powers");
-        FAIL() << "missing parent accepted";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Table not found: T3999Ain CSV.");
-    }
+    EXPECT_EQ(errorText([&] { m_csv.CreateSubTable("T3872A", "banded"); }),
+              "Table already exists!: banded");
+    EXPECT_EQ(errorText([&] { m_csv.CreateSubTable("T3999A", "Preset Powers"); }),
+              "Table not found: T3999Ain CSV.");
 }
 
 TEST_F(TableCutting, FindTableByContainmentOldestFirst) {
@@ -206,12 +200,8 @@ TEST_F(TableCutting, FindRowModes) {
     found.clear();
     m_csv.findRow({"cherry", "green"}, found, "any");
     EXPECT_EQ(found, (std::vector<std::string>{"Red Cherry", "Green Apple"}));
-    try {
-        m_csv.findRow({}, found, "ALL");
-        FAIL() << "empty partials accepted";
-    } catch (const std::string& text) {
-        EXPECT_EQ(text, "Partial string vector empty! (CContainer::findRow)");
-    }
+    EXPECT_EQ(errorText([&] { m_csv.findRow({}, found, "ALL"); }),
+              "Partial string vector empty! (CContainer::findRow)");
 }
 
 TEST_F(TableCutting, FindColumnCollectsHeadingsOnlyWithHeader) {
