@@ -51,14 +51,6 @@ class ReaderRobustness : public ::testing::Test {
     std::mt19937 m_random{20240611};
 };
 
-TEST_F(ReaderRobustness, SampleReadsCleanly) {
-    ASSERT_GT(m_sample.size(), 1000U);
-    CT3872Acomcal config;
-    config.SetModel("T3872A");
-    config.SetOptions({"010", "080"});
-    EXPECT_NO_THROW(config.ReadSequence(testsupport::sampleConfiguration().string()));
-}
-
 TEST_F(ReaderRobustness, TruncatedFiles) {
     for (int i = 0; i < 15; ++i) {
         std::size_t cut = m_random() % m_sample.size();
