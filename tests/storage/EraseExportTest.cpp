@@ -2,8 +2,8 @@
 
 #include <sstream>
 
+#include "ErrorOf.h"
 #include "SimBench.h"
-#include "platform/ErrorText.h"
 #include "storage/EraseCal.h"
 #include "storage/ExportCals.h"
 #include "storage/ExportText.h"
@@ -142,12 +142,9 @@ TEST(ExportCals, MillimetreWaveReadsPortFilesAndLowFrequencyNamesUseTheirFlashNa
 TEST(ExportCals, UnwritableExportFileRaisesNamingIt) {
     SimBench bench(R"("stored": [{"receiver": "A", "age_days": 1, "records": 1}])");
     std::filesystem::create_directories(bench.workDir() / "RcvrChar_A_Exported.txt" / "x");
-    std::string text;
-    try {
+    auto text = testsupport::errorOf([&] {
         storage::exportStoredCals(bench.context(), {"A"}, {{"A", 1}});
-    } catch (...) {
-        text = platform::currentErrorText();
-    }
+    });
     EXPECT_EQ(text.rfind("Cannot write the export file RcvrChar_A_Exported.txt (", 0), 0u) << text;
 }
 

@@ -29,6 +29,20 @@ RcvrCharImage imageOf(const std::string& receiver, std::uint32_t records) {
     return image;
 }
 
+std::string dataFile(int port, const char* file) {
+    return kConfigurations + "T3951A Broadband\\Port " + std::to_string(port) +
+           "\\Factory Cal Data\\" + file;
+}
+
+// A refused push names the file and the reason, leaves no partial file and pushes nothing.
+void expectRefused(SimBench& bench, const std::string& text, const std::string& path,
+                   const std::string& reason) {
+    EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
+                        bench.local(path).string() + "): " + reason);
+    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
+    EXPECT_TRUE(bench.commands().empty());
+}
+
 // Limits the size of files this process may write, as a full disk would, for one scope.
 class FileSizeLimit {
   public:
@@ -84,7 +98,7 @@ TEST(PortDataFile, NamesWithoutAPortAreRefused) {
 TEST(PushPortFile, WritesTheImageAndPushesItsPort) {
     SimBench bench(storagetest::kMillimetreWave);
     ASSERT_TRUE(bench.analyzer->ismmwave());
-    auto path = kConfigurations + "T3951A Broadband\\Port 2\\Factory Cal Data\\RcvrCharTest.dat";
+    auto path = dataFile(2, "RcvrCharTest.dat");
     testsupport::writeFile(bench.local(path), std::string(9000, 'x'));  // replaced whole
     auto image = imageOf("B", 3);
     auto waitedBefore = bench.clock.totalWaited();
@@ -106,14 +120,6 @@ TEST(PushPortFile, WritesTheImageAndPushesItsPort) {
               image);
 }
 
-TEST(PushPortFile, ReferenceReceiverGoesToItsPortsRefFile) {
-    SimBench bench(storagetest::kMillimetreWave);
-    storage::pushPortFile(bench.context(), "R3", imageOf("R3", 1));
-    EXPECT_TRUE(std::filesystem::exists(bench.local(
-        kConfigurations + "T3951A Broadband\\Port 3\\Factory Cal Data\\RcvrCharRef.dat")));
-    EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 3,0"});
-}
-
 TEST(PushPortFile, TwoAnalyzerErrorsShowInOneBoxAndInTheLog) {
     SimBench bench(std::string(storagetest::kMillimetreWave) + R"(, "faults": {"scpi_errors": [
         {"command": "diag:mm:data:push", "errors": ["-200,\"Execution error\"",
@@ -133,20 +139,16 @@ TEST(PushPortFile, TwoAnalyzerErrorsShowInOneBoxAndInTheLog) {
 
 TEST(PushPortFile, MissingFolderRaisesAndSendsNoPush) {
     SimBench bench(storagetest::kMillimetreWave);
-    auto folder = kConfigurations + "T3951A Broadband\\Port 4\\Factory Cal Data";
-    std::filesystem::remove_all(bench.local(folder));
+    auto path = dataFile(4, "RcvrCharTest.dat");
+    std::filesystem::remove_all(bench.local(path).parent_path());
     auto text = errorOf([&] { storage::pushPortFile(bench.context(), "D", imageOf("D", 1)); });
-    EXPECT_EQ(text, "Cannot write the characterization data file " + folder +
-                        "\\RcvrCharTest.dat (" +
-                        bench.local(folder + "\\RcvrCharTest.dat").string() +
-                        "): No such file or directory");
-    EXPECT_TRUE(bench.commands().empty());
+    expectRefused(bench, text, path, "No such file or directory");
     EXPECT_EQ(bench.logLines(), std::vector<std::string>{"Initialized file"});
 }
 
 TEST(PushPortFile, FullDiskKeepsTheOldFileWholeAndSendsNoPush) {
     SimBench bench(storagetest::kMillimetreWave);
-    auto path = kConfigurations + "T3951A Broadband\\Port 1\\Factory Cal Data\\RcvrCharRef.dat";
+    auto path = dataFile(1, "RcvrCharRef.dat");
     auto old = imageOf("R1", 1).bytes();
     testsupport::writeFile(bench.local(path), old);
     std::string text;
@@ -154,22 +156,16 @@ TEST(PushPortFile, FullDiskKeepsTheOldFileWholeAndSendsNoPush) {
         FileSizeLimit limit(200);
         text = errorOf([&] { storage::pushPortFile(bench.context(), "R1", imageOf("R1", 10)); });
     }
-    EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
-                        bench.local(path).string() + "): File too large");
+    expectRefused(bench, text, path, "File too large");
     EXPECT_EQ(testsupport::readFile(bench.local(path)), old);
-    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
-    EXPECT_TRUE(bench.commands().empty());
 }
 
 TEST(PushPortFile, TargetThatCannotBeReplacedRaisesWithTheReason) {
     SimBench bench(storagetest::kMillimetreWave);
-    auto path = kConfigurations + "T3951A Broadband\\Port 2\\Factory Cal Data\\RcvrCharRef.dat";
+    auto path = dataFile(2, "RcvrCharRef.dat");
     std::filesystem::create_directories(bench.local(path) / "occupied");
     auto text = errorOf([&] { storage::pushPortFile(bench.context(), "R2", imageOf("R2", 1)); });
-    EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
-                        bench.local(path).string() + "): Is a directory");
-    EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
-    EXPECT_TRUE(bench.commands().empty());
+    expectRefused(bench, text, path, "Is a directory");
 }
 
 TEST(ReloadFromFlash, SendsLoadAndPushAndLogsBoth) {

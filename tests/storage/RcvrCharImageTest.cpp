@@ -221,15 +221,12 @@ TEST(ExportText, LevelCountSetsTriplesAndIncompleteImagesGiveHeaderOnly) {
     EXPECT_EQ(two.str().substr(two.str().rfind('\n') + 1),
               "1500000000, (-10.5,-0.050000001,-0.15000001), (-9.25,-0.1,-0.30000001)");
 
-    words = sampleImage().words();
-    words.pop_back();
-    std::ostringstream truncated;
-    EXPECT_FALSE(storage::writeExportText(truncated, RcvrCharImage(words)));
-    EXPECT_EQ(truncated.str(), "1\nR1\n25\n-3.25\n30");
-
-    words = sampleImage().words();
-    words[3] = 9;
-    std::ostringstream badLevels;
-    EXPECT_FALSE(storage::writeExportText(badLevels, RcvrCharImage(words)));
-    EXPECT_EQ(badLevels.str(), "1\nR1\n25\n-3.25\n30");
+    // A missing last word and nine levels per record.
+    for (bool truncate : {true, false}) {
+        words = sampleImage().words();
+        truncate ? words.pop_back() : void(words[3] = 9);
+        std::ostringstream out;
+        EXPECT_FALSE(storage::writeExportText(out, RcvrCharImage(words))) << truncate;
+        EXPECT_EQ(out.str(), "1\nR1\n25\n-3.25\n30") << truncate;
+    }
 }
