@@ -41,11 +41,11 @@ int count(const std::vector<std::string>& list, const std::string& item) {
 }  // namespace
 
 TEST(CharacterizationRun, AlmostDoneNeedsMoreThanFiveLevels) {
-    SimRun five("", "T3872A", "010,080", testPower("-30,-22"));
+    SimRun five("", "T3872A", {"010", "080"}, testPower("-30,-22"));
     ASSERT_EQ(five.run({"A"}), 0);
     EXPECT_EQ(count(five.notices(), "Almost Done with Cal"), 0);
 
-    SimRun six("", "T3872A", "010,080", testPower("-30,-20"));
+    SimRun six("", "T3872A", {"010", "080"}, testPower("-30,-20"));
     six.noticeSink.trigger = "Almost Done";
     six.noticeSink.onTrigger = [&six] {
         // Right after the first level: one level's traces are filed.
@@ -128,7 +128,7 @@ TEST(CharacterizationRun, AbortDuringTheSecondLevelStopsBeforeTheThird) {
 }
 
 TEST(CharacterizationRun, ErrorsEndTheRunWithAnErrorBox) {
-    SimRun noMinband("", "T3872A", "010,080", [](std::string& text) {
+    SimRun noMinband("", "T3872A", {"010", "080"}, [](std::string& text) {
         replaceLine(text, "minband,", "");
         replaceLine(text, ",Minband,", "");
     });
@@ -140,7 +140,7 @@ TEST(CharacterizationRun, ErrorsEndTheRunWithAnErrorBox) {
     EXPECT_EQ(noMinband.notices().back(), "Error in Cal");
     EXPECT_EQ(count(noMinband.notices(), "Started Cal A"), 0);
 
-    SimRun emptyLadder("", "T3872A", "010,080", testPower("-30,-40"));
+    SimRun emptyLadder("", "T3872A", {"010", "080"}, testPower("-30,-40"));
     EXPECT_EQ(emptyLadder.run({"A"}), 1);
     EXPECT_EQ(emptyLadder.ui.boxes().back().box.text,
               "The power ladder teststartpower -30, teststoppower -40, testpowerstep 2 has no "
@@ -171,7 +171,7 @@ TEST(CharacterizationRun, NarrowbandFaultsAskTheOperator) {
 TEST(CharacterizationRun, DirectModeInstructionsAndExternalReference) {
     SimRun sim(R"("idn": "Velquor Technologies,T3871B,MY00000003,A.13.55.06",
                   "options": "010", "port_count": 2)",
-               "T3871B", "010");
+               "T3871B", {"010"});
     ASSERT_EQ(sim.run({"A"}, "Direct-Search"), 0) << ::testing::PrintToString(sim.notices());
     const auto boxes = sim.ui.boxes();
     ASSERT_FALSE(boxes.empty());

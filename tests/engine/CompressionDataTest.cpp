@@ -6,7 +6,6 @@
 #include "ErrorOf.h"
 #include "TempDir.h"
 #include "engine/CompressionData.h"
-#include "platform/ErrorText.h"
 #include "platform/ScriptedOperatorUi.h"
 
 using engine::CCompressionData;

@@ -2,9 +2,9 @@
 
 #include <sstream>
 
+#include "ErrorOf.h"
 #include "TempDir.h"
 #include "engine/CompressionData.h"
-#include "platform/ErrorText.h"
 #include "platform/ScriptedOperatorUi.h"
 #include "storage/ResultProcessing.h"
 
@@ -193,13 +193,8 @@ TEST(JudgeResults, TheOperatorDecidesOnBadData) {
     {
         Measured data({1e9}, {bad}, limits);
         data.ui.badData({platform::BadDataChoice::Quit});
-        try {
-            data.judge("R2");
-            FAIL() << "quitting did not end the run";
-        } catch (...) {
-            EXPECT_EQ(platform::currentErrorText(),
-                      "User aborted characterization due to bad data on receiver R2");
-        }
+        EXPECT_EQ(testsupport::errorOf([&] { data.judge("R2"); }),
+                  "User aborted characterization due to bad data on receiver R2");
     }
 }
 

@@ -12,7 +12,8 @@ void CollectingNotices::postnotice(const std::string& text) {
 }
 
 SimRun::SimRun(const std::string& scenarioMembers, const std::string& model,
-               const std::string& options, const std::function<void(std::string&)>& configEdit)
+               const std::vector<std::string>& options,
+               const std::function<void(std::string&)>& configEdit)
     : simulator(std::make_unique<sim::SimulatedAnalyzer>(
           sim::Scenario::fromJson("{" + scenarioMembers + "}"), dir / "analyzer")),
       paths(dir / "work"),
@@ -35,13 +36,7 @@ SimRun::SimRun(const std::string& scenarioMembers, const std::string& model,
     }
     testsupport::writeFile(workDir() / "RcvrChar.dat", text);
     config.SetModel(model);
-    std::vector<std::string> optionList;
-    for (std::size_t start = 0; start <= options.size();) {
-        auto comma = options.find(',', start);
-        optionList.push_back(options.substr(start, comma - start));
-        start = comma == std::string::npos ? options.size() + 1 : comma + 1;
-    }
-    config.SetOptions(optionList);
+    config.SetOptions(options);
     config.ReadSequence((workDir() / "RcvrChar.dat").string());
     analyzer->preparecal();
     simulator->clearTranscript();

@@ -32,7 +32,7 @@ class SimRun {
     // scenarioMembers: members of the scenario's JSON object, without braces.
     // configEdit: changes the sample configuration's text before it is read.
     explicit SimRun(const std::string& scenarioMembers = "", const std::string& model = "T3872A",
-                    const std::string& options = "010,080",
+                    const std::vector<std::string>& options = {"010", "080"},
                     const std::function<void(std::string&)>& configEdit = nullptr);
 
     int run(std::vector<std::string> receivers, const std::string& searchMode = "Port-Search");
