@@ -4,9 +4,7 @@
 
 namespace fakeanalyzer {
 
-namespace {
-
-std::string number(double value) {
+std::string CallLog::number(double value) {
     std::string text = std::to_string(value);
     text.erase(text.find_last_not_of('0') + 1);
     if (text.back() == '.') {
@@ -14,8 +12,6 @@ std::string number(double value) {
     }
     return text;
 }
-
-}  // namespace
 
 std::vector<std::string> CallLog::scpi() const {
     std::vector<std::string> result;
@@ -57,18 +53,9 @@ std::string FakeParser::parse(const std::string& command) {
     return answer;
 }
 
-void FakeMeasurement::setFirstSetting(int value) {
-    m_log->calls.push_back("measurement.setFirstSetting(" + std::to_string(value) + ")");
-}
-
-void FakeMeasurement::setSecondSetting(int value) {
-    m_log->calls.push_back("measurement.setSecondSetting(" + std::to_string(value) + ")");
-}
-
 long FakeMeasurement::readData(int location, int formatCode, long& points,
                                std::span<float> destination) {
-    m_log->calls.push_back("measurement " + m_name + ".readData(" + std::to_string(location) + "," +
-                           std::to_string(formatCode) + "," + std::to_string(points) + ")");
+    m_log->add("measurement " + m_name + ".readData", location, formatCode, points);
     if (status != 0) {
         return status;
     }
@@ -86,114 +73,6 @@ std::shared_ptr<automation::Object> FakeCollection::item(int index) {
         return nullptr;
     }
     return items[static_cast<std::size_t>(index - 1)];
-}
-
-void FakeSegmentTable::writeTable(const std::vector<automation::SegmentRow>& written) {
-    rows = written;
-    m_log->calls.push_back("segments.writeTable(" + std::to_string(written.size()) + ")");
-}
-
-void FakeSegmentTable::setPerSegmentBandwidth(int on) {
-    m_log->calls.push_back("segments.setPerSegmentBandwidth(" + std::to_string(on) + ")");
-}
-
-void FakeSegmentTable::enablePerSegmentPower() {
-    m_log->calls.push_back("segments.enablePerSegmentPower()");
-}
-
-void FakeChannel::setSweepType(int code) {
-    m_log->calls.push_back("channel.setSweepType(" + std::to_string(code) + ")");
-}
-double FakeChannel::startFrequency() {
-    m_log->calls.push_back("channel.startFrequency()");
-    return start;
-}
-double FakeChannel::stopFrequency() {
-    m_log->calls.push_back("channel.stopFrequency()");
-    return stop;
-}
-void FakeChannel::setCwFrequency(double hz) {
-    m_log->calls.push_back("channel.setCwFrequency(" + number(hz) + ")");
-    start = stop = hz;
-}
-double FakeChannel::startPower() {
-    m_log->calls.push_back("channel.startPower()");
-    return powerStart;
-}
-double FakeChannel::stopPower() {
-    m_log->calls.push_back("channel.stopPower()");
-    return powerStop;
-}
-void FakeChannel::setStartPower(double dbm) {
-    m_log->calls.push_back("channel.setStartPower(" + number(dbm) + ")");
-    powerStart = dbm;
-}
-void FakeChannel::setStopPower(double dbm) {
-    m_log->calls.push_back("channel.setStopPower(" + number(dbm) + ")");
-    powerStop = dbm;
-}
-void FakeChannel::setIfBandwidth(double hz) {
-    m_log->calls.push_back("channel.setIfBandwidth(" + number(hz) + ")");
-}
-long FakeChannel::numberOfPoints() {
-    m_log->calls.push_back("channel.numberOfPoints()");
-    return points;
-}
-void FakeChannel::setNumberOfPoints(long value) {
-    m_log->calls.push_back("channel.setNumberOfPoints(" + std::to_string(value) + ")");
-    points = value;
-}
-void FakeChannel::setAttenuatorMode(int port, int mode) {
-    m_log->calls.push_back("channel.setAttenuatorMode(" + std::to_string(port) + "," +
-                           std::to_string(mode) + ")");
-}
-void FakeChannel::setTriggerSetting(int value) {
-    m_log->calls.push_back("channel.setTriggerSetting(" + std::to_string(value) + ")");
-}
-void FakeChannel::singleSweep() {
-    m_log->calls.push_back("channel.singleSweep()");
-}
-void FakeChannel::setContinuousSweep(bool on) {
-    m_log->calls.push_back(std::string("channel.setContinuousSweep(") + (on ? "true" : "false") +
-                           ")");
-}
-void FakeChannel::setIfBandwidthSwitch(bool on) {
-    m_log->calls.push_back(std::string("channel.setIfBandwidthSwitch(") + (on ? "true" : "false") +
-                           ")");
-}
-std::shared_ptr<automation::Object> FakeChannel::segmentTable() {
-    m_log->calls.push_back("channel.segmentTable()");
-    return m_segmentTable;
-}
-
-std::shared_ptr<automation::Object> FakeApplication::scpiParser() {
-    m_log->calls.push_back("app.scpiParser()");
-    return parser;
-}
-void FakeApplication::reset() {
-    m_log->calls.push_back("app.reset()");
-}
-void FakeApplication::preset(int value) {
-    m_log->calls.push_back("app.preset(" + std::to_string(value) + ")");
-}
-std::shared_ptr<automation::Object> FakeApplication::activeChannel() {
-    m_log->calls.push_back("app.activeChannel()");
-    return channel;
-}
-std::shared_ptr<automation::Object> FakeApplication::currentMeasurement() {
-    m_log->calls.push_back("app.currentMeasurement()");
-    return current;
-}
-std::shared_ptr<automation::Object> FakeApplication::measurements() {
-    m_log->calls.push_back("app.measurements()");
-    return collection;
-}
-void FakeApplication::setTriggerSetting(int value) {
-    m_log->calls.push_back("app.setTriggerSetting(" + std::to_string(value) + ")");
-}
-void FakeApplication::wait(int value, int timeLimitMs) {
-    m_log->calls.push_back("app.wait(" + std::to_string(value) + "," + std::to_string(timeLimitMs) +
-                           ")");
 }
 
 FakeAnalyzer::FakeAnalyzer()

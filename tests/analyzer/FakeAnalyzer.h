@@ -7,6 +7,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <type_traits>
 #include <vector>
 
 #include "analyzer/automation/Automation.h"
@@ -20,6 +21,26 @@ struct CallLog {
     // Calls whose text starts with prefix, in order.
     std::vector<std::string> matching(const std::string& prefix) const;
     void clear() { calls.clear(); }
+    // Records "what(a,b)": whole numbers as such, doubles without trailing zeros.
+    template <typename... Args>
+    void add(const std::string& what, const Args&... args) {
+        std::string text;
+        ((text += (text.empty() ? "" : ",") + argument(args)), ...);
+        calls.push_back(what + "(" + text + ")");
+    }
+
+  private:
+    static std::string number(double value);
+    template <typename T>
+    static std::string argument(T value) {
+        if constexpr (std::is_same_v<T, bool>) {
+            return value ? "true" : "false";
+        } else if constexpr (std::is_floating_point_v<T>) {
+            return number(value);
+        } else {
+            return std::to_string(value);
+        }
+    }
 };
 
 class FakeParser : public automation::ScpiParser {
@@ -42,8 +63,8 @@ class FakeMeasurement : public automation::Measurement, public automation::Measu
         : m_log(std::move(log)), m_name(std::move(name)), m_parameter(std::move(parameter)) {}
     std::string name() override { return m_name; }
     std::string parameter() override { return m_parameter; }
-    void setFirstSetting(int value) override;
-    void setSecondSetting(int value) override;
+    void setFirstSetting(int value) override { m_log->add("measurement.setFirstSetting", value); }
+    void setSecondSetting(int value) override { m_log->add("measurement.setSecondSetting", value); }
     // Fills value i with formatCode * 1000 + i.
     long readData(int location, int formatCode, long& points,
                   std::span<float> destination) override;
@@ -68,9 +89,14 @@ class FakeCollection : public automation::MeasurementCollection {
 class FakeSegmentTable : public automation::SegmentTable {
   public:
     explicit FakeSegmentTable(std::shared_ptr<CallLog> log) : m_log(std::move(log)) {}
-    void writeTable(const std::vector<automation::SegmentRow>& rows) override;
-    void setPerSegmentBandwidth(int on) override;
-    void enablePerSegmentPower() override;
+    void writeTable(const std::vector<automation::SegmentRow>& written) override {
+        rows = written;
+        m_log->add("segments.writeTable", written.size());
+    }
+    void setPerSegmentBandwidth(int on) override {
+        m_log->add("segments.setPerSegmentBandwidth", on);
+    }
+    void enablePerSegmentPower() override { m_log->add("segments.enablePerSegmentPower"); }
 
     std::vector<automation::SegmentRow> rows;
 
@@ -82,23 +108,39 @@ class FakeChannel : public automation::Channel {
   public:
     FakeChannel(std::shared_ptr<CallLog> log, std::shared_ptr<automation::Object> segmentTable)
         : m_log(std::move(log)), m_segmentTable(std::move(segmentTable)) {}
-    void setSweepType(int code) override;
-    double startFrequency() override;
-    double stopFrequency() override;
-    void setCwFrequency(double hz) override;
-    double startPower() override;
-    double stopPower() override;
-    void setStartPower(double dbm) override;
-    void setStopPower(double dbm) override;
-    void setIfBandwidth(double hz) override;
-    long numberOfPoints() override;
-    void setNumberOfPoints(long points) override;
-    void setAttenuatorMode(int port, int mode) override;
-    void setTriggerSetting(int value) override;
-    void singleSweep() override;
-    void setContinuousSweep(bool on) override;
-    void setIfBandwidthSwitch(bool on) override;
-    std::shared_ptr<automation::Object> segmentTable() override;
+    void setSweepType(int code) override { m_log->add("channel.setSweepType", code); }
+    double startFrequency() override { return logged("channel.startFrequency", start); }
+    double stopFrequency() override { return logged("channel.stopFrequency", stop); }
+    void setCwFrequency(double hz) override {
+        m_log->add("channel.setCwFrequency", hz);
+        start = stop = hz;
+    }
+    double startPower() override { return logged("channel.startPower", powerStart); }
+    double stopPower() override { return logged("channel.stopPower", powerStop); }
+    void setStartPower(double dbm) override {
+        m_log->add("channel.setStartPower", dbm);
+        powerStart = dbm;
+    }
+    void setStopPower(double dbm) override {
+        m_log->add("channel.setStopPower", dbm);
+        powerStop = dbm;
+    }
+    void setIfBandwidth(double hz) override { m_log->add("channel.setIfBandwidth", hz); }
+    long numberOfPoints() override { return logged("channel.numberOfPoints", points); }
+    void setNumberOfPoints(long value) override {
+        m_log->add("channel.setNumberOfPoints", value);
+        points = value;
+    }
+    void setAttenuatorMode(int port, int mode) override {
+        m_log->add("channel.setAttenuatorMode", port, mode);
+    }
+    void setTriggerSetting(int value) override { m_log->add("channel.setTriggerSetting", value); }
+    void singleSweep() override { m_log->add("channel.singleSweep"); }
+    void setContinuousSweep(bool on) override { m_log->add("channel.setContinuousSweep", on); }
+    void setIfBandwidthSwitch(bool on) override { m_log->add("channel.setIfBandwidthSwitch", on); }
+    std::shared_ptr<automation::Object> segmentTable() override {
+        return logged("channel.segmentTable", m_segmentTable);
+    }
 
     double start = 10e6;
     double stop = 20e9;
@@ -107,6 +149,11 @@ class FakeChannel : public automation::Channel {
     long points = 201;
 
   private:
+    template <typename T>
+    T logged(const std::string& call, T value) {
+        m_log->add(call);
+        return value;
+    }
     std::shared_ptr<CallLog> m_log;
     std::shared_ptr<automation::Object> m_segmentTable;
 };
@@ -114,14 +161,22 @@ class FakeChannel : public automation::Channel {
 class FakeApplication : public automation::Application {
   public:
     explicit FakeApplication(std::shared_ptr<CallLog> log) : m_log(std::move(log)) {}
-    std::shared_ptr<automation::Object> scpiParser() override;
-    void reset() override;
-    void preset(int value) override;
-    std::shared_ptr<automation::Object> activeChannel() override;
-    std::shared_ptr<automation::Object> currentMeasurement() override;
-    std::shared_ptr<automation::Object> measurements() override;
-    void setTriggerSetting(int value) override;
-    void wait(int value, int timeLimitMs) override;
+    std::shared_ptr<automation::Object> scpiParser() override {
+        return logged("app.scpiParser", parser);
+    }
+    void reset() override { m_log->add("app.reset"); }
+    void preset(int value) override { m_log->add("app.preset", value); }
+    std::shared_ptr<automation::Object> activeChannel() override {
+        return logged("app.activeChannel", channel);
+    }
+    std::shared_ptr<automation::Object> currentMeasurement() override {
+        return logged("app.currentMeasurement", current);
+    }
+    std::shared_ptr<automation::Object> measurements() override {
+        return logged("app.measurements", collection);
+    }
+    void setTriggerSetting(int value) override { m_log->add("app.setTriggerSetting", value); }
+    void wait(int value, int timeLimitMs) override { m_log->add("app.wait", value, timeLimitMs); }
 
     std::shared_ptr<automation::Object> parser;
     std::shared_ptr<automation::Object> channel;
@@ -129,6 +184,11 @@ class FakeApplication : public automation::Application {
     std::shared_ptr<automation::Object> collection;
 
   private:
+    template <typename T>
+    T logged(const std::string& call, T value) {
+        m_log->add(call);
+        return value;
+    }
     std::shared_ptr<CallLog> m_log;
 };
 
