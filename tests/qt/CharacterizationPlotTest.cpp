@@ -5,6 +5,7 @@
 #include <QtCharts/QCategoryAxis>
 #include <QtCharts/QLineSeries>
 #include <QtCharts/QValueAxis>
+#include <regex>
 #include <sstream>
 
 #include "ErrorOf.h"
@@ -15,9 +16,8 @@
 
 namespace {
 
-using testsupport::errorOf;
-
 using qtui::ChartView;
+using testsupport::errorOf;
 using testsupport::readFile;
 using testsupport::writeFile;
 
@@ -98,51 +98,50 @@ TEST_F(CharacterizationPlot, BandEdgesMarkBothEndsOfAGapBetweenBands) {
     EXPECT_EQ(data.bandEdges(), (std::vector<double>{1e9, 3e9, 10e9, 20e9}));
 }
 
-TEST_F(CharacterizationPlot, PowerChartHasOneSeriesPerLevelAndAxesSpanTheData) {
+TEST_F(CharacterizationPlot, ChartsHaveOneSeriesPerLevelAndAxesSpanTheData) {
+    struct Case {
+        ChartView view;
+        const char* what;
+        QString yTitle;
+        double first, last;  // level 0 at 1 GHz and 6 GHz; each level adds perLevel
+        double perLevel;
+        double yMin, yMax;  // the values' span and 5 % margin on either side
+    };
     const auto data = qtui::fromImage(knownImage());
-    auto chart = qtui::makeCharacterizationChart(data, ChartView::CompressionPower);
-    const auto series = chart->series();
-    ASSERT_EQ(series.size(), 4);
-    const QStringList names{"0.05 dB", "0.1 dB", "0.2 dB", "0.5 dB"};
-    for (int k = 0; k < 4; ++k) {
-        auto* line = qobject_cast<QLineSeries*>(series[k]);
-        ASSERT_NE(line, nullptr);
-        EXPECT_EQ(line->name(), names[k]);
-        ASSERT_EQ(line->count(), 10);
-        EXPECT_DOUBLE_EQ(line->at(0).x(), 1.0);
-        EXPECT_NEAR(line->at(0).y(), -9.0 + k, 1e-5);
-        EXPECT_NEAR(line->at(9).y(), -4.0 + k, 1e-5);
+    for (const auto& c : {Case{ChartView::CompressionPower, "power", "Compression power (dBm)", -9,
+                               -4, 1, -9.4, -0.6},
+                          Case{ChartView::CompressionPhase, "phase", "Compression phase (deg)", -1,
+                               -6, 2, -6.55, 5.55}}) {
+        SCOPED_TRACE(c.what);
+        auto chart = qtui::makeCharacterizationChart(data, c.view);
+        const auto series = chart->series();
+        ASSERT_EQ(series.size(), 4);
+        const QStringList names{"0.05 dB", "0.1 dB", "0.2 dB", "0.5 dB"};
+        for (int k = 0; k < 4; ++k) {
+            auto* line = qobject_cast<QLineSeries*>(series[k]);
+            ASSERT_NE(line, nullptr);
+            EXPECT_EQ(line->name(), names[k]);
+            ASSERT_EQ(line->count(), 10);
+            EXPECT_DOUBLE_EQ(line->at(0).x(), 1.0);
+            EXPECT_NEAR(line->at(0).y(), c.first + c.perLevel * k, 1e-5);
+            EXPECT_NEAR(line->at(9).y(), c.last + c.perLevel * k, 1e-5);
+        }
+        auto* x = axisOf<QValueAxis>(*chart, Qt::AlignBottom);
+        auto* y = axisOf<QValueAxis>(*chart, Qt::AlignLeft);
+        ASSERT_NE(x, nullptr);
+        ASSERT_NE(y, nullptr);
+        EXPECT_EQ(x->titleText(), "Frequency (GHz)");
+        EXPECT_DOUBLE_EQ(x->min(), 1.0);
+        EXPECT_DOUBLE_EQ(x->max(), 6.0);
+        EXPECT_EQ(y->titleText(), c.yTitle);
+        EXPECT_NEAR(y->min(), c.yMin, 1e-4);
+        EXPECT_NEAR(y->max(), c.yMax, 1e-4);
+        auto* edges = axisOf<QCategoryAxis>(*chart, Qt::AlignTop);
+        ASSERT_NE(edges, nullptr);
+        EXPECT_EQ(edges->categoriesLabels(), (QStringList{"2 GHz", "6 GHz"}));
+        EXPECT_DOUBLE_EQ(edges->startValue(), 1.0);
+        EXPECT_EQ(chart->title(), QString("Receiver B: compression ") + c.what);
     }
-    auto* x = axisOf<QValueAxis>(*chart, Qt::AlignBottom);
-    auto* y = axisOf<QValueAxis>(*chart, Qt::AlignLeft);
-    ASSERT_NE(x, nullptr);
-    ASSERT_NE(y, nullptr);
-    EXPECT_EQ(x->titleText(), "Frequency (GHz)");
-    EXPECT_DOUBLE_EQ(x->min(), 1.0);
-    EXPECT_DOUBLE_EQ(x->max(), 6.0);
-    EXPECT_EQ(y->titleText(), "Compression power (dBm)");
-    // Values span -9 .. -1 dBm; 5 % margin on either side.
-    EXPECT_NEAR(y->min(), -9.4, 1e-4);
-    EXPECT_NEAR(y->max(), -0.6, 1e-4);
-    auto* edges = axisOf<QCategoryAxis>(*chart, Qt::AlignTop);
-    ASSERT_NE(edges, nullptr);
-    EXPECT_EQ(edges->categoriesLabels(), (QStringList{"2 GHz", "6 GHz"}));
-    EXPECT_DOUBLE_EQ(edges->startValue(), 1.0);
-    EXPECT_EQ(chart->title(), "Receiver B: compression power");
-}
-
-TEST_F(CharacterizationPlot, PhaseChartPlotsThePhaseOfEachLevel) {
-    const auto data = qtui::fromImage(knownImage());
-    auto chart = qtui::makeCharacterizationChart(data, ChartView::CompressionPhase);
-    auto* last = qobject_cast<QLineSeries*>(chart->series().at(3));
-    ASSERT_NE(last, nullptr);
-    EXPECT_NEAR(last->at(0).y(), 5.0, 1e-5);
-    EXPECT_NEAR(last->at(9).y(), 0.0, 1e-5);
-    auto* y = axisOf<QValueAxis>(*chart, Qt::AlignLeft);
-    EXPECT_EQ(y->titleText(), "Compression phase (deg)");
-    EXPECT_NEAR(y->min(), -6.0 - 0.55, 1e-4);
-    EXPECT_NEAR(y->max(), 5.0 + 0.55, 1e-4);
-    EXPECT_EQ(chart->title(), "Receiver B: compression phase");
 }
 
 TEST_F(CharacterizationPlot, DefaultedCharacterizationStillDrawsWithANote) {
@@ -166,33 +165,25 @@ TEST_F(CharacterizationPlot, ExportTextGivesTheSameChartDataAsTheImage) {
         EXPECT_EQ(parsed.records[i].levels, fromImage.records[i].levels);
     }
     // Windows line ends, as the analyzer's own platform writes them.
-    std::string crlf;
-    for (char c : exportText(fromImage)) {
-        if (c == '\n') {
-            crlf += '\r';
-        }
-        crlf += c;
-    }
+    const auto crlf = std::regex_replace(exportText(fromImage), std::regex("\n"), "\r\n");
     EXPECT_EQ(qtui::parseExportText(crlf).records.size(), 12u);
 }
 
 TEST_F(CharacterizationPlot, MalformedInputIsReportedWithWhatWasWrong) {
-    EXPECT_EQ(errorOf([] { qtui::parseExportText("1\nB\n25\n"); }),
-              "Export text has 3 header lines; expected 5 (version, receiver, 25, loss, "
-              "attenuator)");
-    EXPECT_EQ(errorOf([] { qtui::parseExportText("2\nB\n25\n0\n30\n"); }),
-              "Export text starts with \"2\"; expected 1");
-    EXPECT_EQ(errorOf([] { qtui::parseExportText("1\nB\n25\n0\n30\n1e9, (1,2,3), (1,2,3)"); }),
-              "Export text line 6: expected ',' at \"\"");
-    EXPECT_EQ(errorOf([] {
-                  qtui::parseExportText("1\nB\n25\n0\n30\n1e9, (1,2,3), (1,2,3), (1,x,3), (1,2,3)");
-              }),
-              "Export text line 6: expected a number at \"x,3), (1,2,3)\"");
-    EXPECT_EQ(errorOf([] {
-                  qtui::parseExportText(
-                      "1\nB\n25\n0\n30\n1e9, (1,2,3), (1,2,3), (1,2,3), (1,2,3), (1,2,3)");
-              }),
-              "Export text line 6: more than 4 compression triples");
+    const std::string header = "1\nB\n25\n0\n30\n";
+    const std::vector<std::pair<std::string, std::string>> cases = {
+        {"1\nB\n25\n",
+         "Export text has 3 header lines; expected 5 (version, receiver, 25, loss, attenuator)"},
+        {"2\nB\n25\n0\n30\n", "Export text starts with \"2\"; expected 1"},
+        {header + "1e9, (1,2,3), (1,2,3)", "Export text line 6: expected ',' at \"\""},
+        {header + "1e9, (1,2,3), (1,2,3), (1,x,3), (1,2,3)",
+         "Export text line 6: expected a number at \"x,3), (1,2,3)\""},
+        {header + "1e9, (1,2,3), (1,2,3), (1,2,3), (1,2,3), (1,2,3)",
+         "Export text line 6: more than 4 compression triples"},
+    };
+    for (const auto& [text, error] : cases) {
+        EXPECT_EQ(errorOf([&] { qtui::parseExportText(text); }), error) << text;
+    }
     auto truncated = knownImage().bytes();
     truncated.resize(truncated.size() - 10);
     EXPECT_EQ(errorOf([&] {
@@ -231,27 +222,22 @@ TEST_F(CharacterizationPlot, FilesOfEitherKindRenderToPngAndSvgOfTheAskedSize) {
 
 TEST_F(CharacterizationPlot, UnusableArgumentsAreRefusedByName) {
     writeFile(dir / "empty.dat", "");
-    EXPECT_EQ(errorOf([&] {
-                  qtui::plotCharacterizationFile(dir / "missing.dat", dir / "x.png",
-                                                 ChartView::CompressionPower, QSize(10, 10));
-              }),
-              "Cannot open characterization file " + (dir / "missing.dat").string());
-    EXPECT_EQ(errorOf([&] {
-                  qtui::plotCharacterizationFile(dir / "empty.dat", dir / "x.png",
-                                                 ChartView::CompressionPower, QSize(10, 10));
-              }),
-              "Characterization file " + (dir / "empty.dat").string() + " is empty");
     writeFile(dir / "image.dat", knownImage().bytes());
-    EXPECT_EQ(errorOf([&] {
-                  qtui::plotCharacterizationFile(dir / "image.dat", dir / "x.jpg",
-                                                 ChartView::CompressionPower, QSize(10, 10));
-              }),
+    const auto plotError = [&](const std::string& input, const std::filesystem::path& output) {
+        return errorOf([&] {
+            qtui::plotCharacterizationFile(dir / input, output, ChartView::CompressionPower,
+                                           QSize(10, 10));
+        });
+    };
+    const auto png = dir / "x.png";
+    EXPECT_EQ(plotError("missing.dat", png),
+              "Cannot open characterization file " + (dir / "missing.dat").string());
+    EXPECT_EQ(plotError("empty.dat", png),
+              "Characterization file " + (dir / "empty.dat").string() + " is empty");
+    EXPECT_EQ(plotError("image.dat", dir / "x.jpg"),
               "Plot output " + (dir / "x.jpg").string() +
                   " must end in .svg or .png to choose the format");
-    EXPECT_EQ(errorOf([&] {
-                  qtui::plotCharacterizationFile(dir / "image.dat", dir / "no" / "such" / "x.png",
-                                                 ChartView::CompressionPower, QSize(10, 10));
-              }),
+    EXPECT_EQ(plotError("image.dat", dir / "no" / "such" / "x.png"),
               "Cannot write plot file " + (dir / "no" / "such" / "x.png").string());
     EXPECT_EQ(errorOf([] { qtui::chartViewFromName("gain"); }),
               "Unknown chart view \"gain\"; use power or phase");

@@ -49,6 +49,16 @@ QMessageBox* visibleBox(const QString& caption) {
     return nullptr;
 }
 
+// Asks from a worker thread and waits until the box is on screen.
+std::future<Answer> askFromWorker(qtui::QtOperatorUi& ui, const std::string& caption,
+                                  Buttons buttons) {
+    auto answer = std::async(std::launch::async, [&ui, caption, buttons] {
+        return ui.messageBox({"Connect the cable", caption, buttons, 0});
+    });
+    EXPECT_TRUE(spinUntil([&] { return visibleBox(QString::fromStdString(caption)) != nullptr; }));
+    return answer;
+}
+
 QAbstractButton* button(QWidget& dialog, int id) {
     return qobject_cast<QAbstractButton*>(qtui::controlById(dialog, id));
 }
@@ -68,14 +78,15 @@ TEST_F(QtDialogs, BadDataDialogIsRelabelledForTheReceiver) {
     EXPECT_EQ(qobject_cast<QLabel*>(qtui::controlById(dialog, 1019))->text(),
               "The characterization data just taken for receiver B appears to be bad.  Please "
               "select an action:");
-    auto* retest = qobject_cast<QPushButton*>(button(dialog, 1011));
-    EXPECT_EQ(retest->text(), "Retest Receiver B");
-    EXPECT_TRUE(retest->isDefault());
-    EXPECT_EQ(retest->geometry(), du.rect(33, 44, 113, 14));
-    EXPECT_EQ(button(dialog, 1010)->text(), "Don't retest, continue with remaining receivers.");
-    EXPECT_EQ(button(dialog, 1010)->geometry(), du.rect(15, 62, 158, 14));
-    EXPECT_EQ(button(dialog, 1016)->text(), "Quit");
-    EXPECT_EQ(button(dialog, 1016)->geometry(), du.rect(63, 82, 50, 14));
+    EXPECT_TRUE(qobject_cast<QPushButton*>(button(dialog, 1011))->isDefault());
+    const std::vector<std::tuple<int, QString, QRect>> buttons = {
+        {1011, "Retest Receiver B", du.rect(33, 44, 113, 14)},
+        {1010, "Don't retest, continue with remaining receivers.", du.rect(15, 62, 158, 14)},
+        {1016, "Quit", du.rect(63, 82, 50, 14)}};
+    for (const auto& [id, text, geometry] : buttons) {
+        EXPECT_EQ(button(dialog, id)->text(), text) << id;
+        EXPECT_EQ(button(dialog, id)->geometry(), geometry) << id;
+    }
 }
 
 TEST_F(QtDialogs, BadDataDialogButtonsGiveTheirChoices) {
@@ -138,15 +149,15 @@ TEST_F(QtDialogs, BoxesMapCaptionTextButtonsAndAnswers) {
     box->button(QMessageBox::Yes)->click();
     EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, Buttons::YesNo), Answer::Yes);
 
+    auto ok = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::Ok, 0}, nullptr);
+    EXPECT_EQ(ok->standardButtons(), QMessageBox::Ok);
+    EXPECT_EQ(ok->icon(), QMessageBox::NoIcon);
+    EXPECT_FALSE(ok->windowFlags() & Qt::WindowStaysOnTopHint);
     auto okCancel = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::OkCancel, 0}, nullptr);
     EXPECT_EQ(okCancel->standardButtons(), QMessageBox::Ok | QMessageBox::Cancel);
     EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Cancel);
     okCancel->button(QMessageBox::Ok)->click();
     EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Ok);
-    auto ok = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::Ok, 0}, nullptr);
-    EXPECT_EQ(ok->standardButtons(), QMessageBox::Ok);
-    EXPECT_EQ(ok->icon(), QMessageBox::NoIcon);
-    EXPECT_FALSE(ok->windowFlags() & Qt::WindowStaysOnTopHint);
 }
 
 TEST_F(QtDialogs, UiThreadBoxIsModalAndReturnsTheButtonPressed) {
@@ -166,11 +177,9 @@ TEST_F(QtDialogs, UiThreadBoxIsModalAndReturnsTheButtonPressed) {
 
 TEST_F(QtDialogs, WorkerBoxLeavesTheUiThreadFreeAndOnlyTheWorkerWaits) {
     qtui::QtOperatorUi ui;
-    auto answer = std::async(std::launch::async, [&] {
-        return ui.messageBox({"Connect the cable", "Connections", Buttons::OkCancel, 0});
-    });
-    ASSERT_TRUE(spinUntil([] { return visibleBox("Connections") != nullptr; }));
+    auto answer = askFromWorker(ui, "Connections", Buttons::OkCancel);
     QMessageBox* box = visibleBox("Connections");
+    ASSERT_NE(box, nullptr);
     EXPECT_FALSE(box->isModal());
     EXPECT_EQ(box->parentWidget(), nullptr);
     EXPECT_EQ(QApplication::activeModalWidget(), nullptr);
@@ -209,10 +218,7 @@ TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
 
 TEST_F(QtDialogs, ClosingWorkerBoxesReleasesTheWaitingWorker) {
     qtui::QtOperatorUi ui;
-    auto answer = std::async(std::launch::async, [&] {
-        return ui.messageBox({"Check the cable", "Check Connection", Buttons::YesNo, 0});
-    });
-    ASSERT_TRUE(spinUntil([] { return visibleBox("Check Connection") != nullptr; }));
+    auto answer = askFromWorker(ui, "Check Connection", Buttons::YesNo);
     ui.closeWorkerBoxes();
     EXPECT_EQ(answer.get(), Answer::No);
     EXPECT_EQ(visibleBox("Check Connection"), nullptr);
@@ -236,55 +242,41 @@ TEST(QtRunProgress, CompletionIsReportedForTheReceiverUnderWay) {
     EXPECT_EQ(watcher.onNotice("Cal Complete\r\n"), std::nullopt);
 }
 
+using Environment = std::vector<std::pair<std::string, std::optional<std::string>>>;
+
 // Sets or clears environment variables for one test and restores them.
-class EnvironmentScope {
-  public:
-    explicit EnvironmentScope(
-        std::vector<std::pair<std::string, std::optional<std::string>>> values) {
-        for (auto& [name, value] : values) {
+struct EnvironmentScope {
+    explicit EnvironmentScope(const Environment& values) {
+        for (const auto& [name, value] : values) {
             const char* old = std::getenv(name.c_str());
-            m_saved.emplace_back(name, old ? std::optional<std::string>(old) : std::nullopt);
+            saved.emplace_back(name, old ? std::optional<std::string>(old) : std::nullopt);
             set(name, value);
         }
     }
     ~EnvironmentScope() {
-        for (auto& [name, value] : m_saved) {
+        for (const auto& [name, value] : saved) {
             set(name, value);
         }
     }
-
-  private:
     static void set(const std::string& name, const std::optional<std::string>& value) {
-        if (value) {
-            setenv(name.c_str(), value->c_str(), 1);
-        } else {
-            unsetenv(name.c_str());
-        }
+        value ? setenv(name.c_str(), value->c_str(), 1) : unsetenv(name.c_str());
     }
-    std::vector<std::pair<std::string, std::optional<std::string>>> m_saved;
+    Environment saved;
 };
 
 TEST(QtDisplay, MissingDisplayIsExplained) {
-    {
-        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt},
-                              {"WAYLAND_DISPLAY", std::nullopt},
-                              {"DISPLAY", std::nullopt}});
-        EXPECT_EQ(qtui::missingDisplay(), "no display: neither DISPLAY nor WAYLAND_DISPLAY is set");
-    }
-    {
-        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt},
-                              {"WAYLAND_DISPLAY", std::nullopt},
-                              {"DISPLAY", ":4711.0"}});
-        EXPECT_EQ(qtui::missingDisplay(),
-                  "no display: DISPLAY is :4711.0 but no X server listens at /tmp/.X11-unix/X4711");
-    }
-    {
-        EnvironmentScope env({{"QT_QPA_PLATFORM", "offscreen"}, {"DISPLAY", std::nullopt}});
-        EXPECT_EQ(qtui::missingDisplay(), std::nullopt);
-    }
-    {
-        EnvironmentScope env({{"QT_QPA_PLATFORM", std::nullopt}, {"WAYLAND_DISPLAY", "wayland-0"}});
-        EXPECT_EQ(qtui::missingDisplay(), std::nullopt);
+    const std::optional<std::string> unset;
+    const std::vector<std::pair<Environment, std::optional<std::string>>> cases = {
+        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", unset}, {"DISPLAY", unset}},
+         "no display: neither DISPLAY nor WAYLAND_DISPLAY is set"},
+        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", unset}, {"DISPLAY", ":4711.0"}},
+         "no display: DISPLAY is :4711.0 but no X server listens at /tmp/.X11-unix/X4711"},
+        {{{"QT_QPA_PLATFORM", "offscreen"}, {"DISPLAY", unset}}, unset},
+        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", "wayland-0"}}, unset},
+    };
+    for (std::size_t i = 0; i < cases.size(); ++i) {
+        EnvironmentScope env(cases[i].first);
+        EXPECT_EQ(qtui::missingDisplay(), cases[i].second) << "case " << i;
     }
 }
 

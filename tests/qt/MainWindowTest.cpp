@@ -52,6 +52,40 @@ void clickReceiver(const TarvexWindow& window, const QString& name) {
     QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, rect.center());
 }
 
+qtui::QtAboutDialog* visibleAbout() {
+    for (auto* widget : QApplication::topLevelWidgets()) {
+        if (auto* about = qobject_cast<qtui::QtAboutDialog*>(widget); about && about->isVisible()) {
+            return about;
+        }
+    }
+    return nullptr;
+}
+
+// Clears the selection, picks these receivers and starts the run.
+void runOnly(const TarvexWindow& window, const std::vector<QString>& receivers) {
+    click(window, 1003);
+    for (const auto& name : receivers) {
+        clickReceiver(window, name);
+    }
+    click(window, 1000);
+}
+
+void whenIdle(qttest::WindowOperator& op, const TarvexWindow& w, std::function<void()> act) {
+    op.then(
+        "the idle dialog", [&w] { return idle(w); }, std::move(act));
+}
+
+// Runs the window with these operator steps; it must end normally with every step done.
+void runWindow(qttest::WindowBench& bench, qttest::WindowOperator& op,
+               const std::function<void(qtui::QtFrontEndParts&, TarvexWindow&)>& steps) {
+    const int status = bench.run([&](qtui::QtFrontEndParts& parts) {
+        steps(parts, parts.window);
+        op.start();
+    });
+    EXPECT_EQ(status, 0);
+    EXPECT_TRUE(op.allStepsDone());
+}
+
 // Indexes of wanted in seen, in order; fails when one is missing.
 void expectInOrder(const std::vector<QString>& seen, const std::vector<QString>& wanted) {
     std::size_t at = 0;
@@ -68,81 +102,74 @@ void expectInOrder(const std::vector<QString>& seen, const std::vector<QString>&
 TEST(QtMainWindow, ControlsLabelsAndPositionsFollowTheTemplate) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
-        op.then(
-            "the idle dialog", [&] { return idle(w); },
-            [&] {
-                EXPECT_EQ(w.windowTitle(), "Receiver Characterization");
-                const qtui::DialogUnits du(w.font());
-                EXPECT_EQ(w.size(), du.size(319, 202));
-                EXPECT_EQ(w.palette().color(QPalette::Window), QColor(232, 232, 232));
-                struct Expected {
-                    int id;
-                    const char* label;
-                    QRect units;
-                };
-                for (const auto& e : {Expected{1, "E&xit", {216, 113, 96, 26}},
-                                      Expected{1000, "&Run Characterization", {8, 113, 96, 26}},
-                                      Expected{1001, "&Abort Cal", {112, 113, 96, 26}},
-                                      Expected{1002, "&Select All", {216, 50, 96, 26}},
-                                      Expected{1003, "C&lear All", {216, 81, 96, 26}},
-                                      Expected{1022, "", {199, 7, 7, 16}}}) {
-                    auto* button = control<QPushButton>(w, e.id);
-                    ASSERT_NE(button, nullptr);
-                    EXPECT_EQ(button->text(), e.label) << e.id;
-                    EXPECT_EQ(button->geometry(),
-                              du.rect(e.units.x(), e.units.y(), e.units.width(), e.units.height()))
-                        << e.id;
-                }
-                EXPECT_TRUE(control<QPushButton>(w, 1)->isDefault());
-                EXPECT_FALSE(control<QPushButton>(w, 1001)->isEnabled());
-                EXPECT_TRUE(control<QPushButton>(w, 1000)->isEnabled());
+    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
+        whenIdle(op, w, [&] {
+            EXPECT_EQ(w.windowTitle(), "Receiver Characterization");
+            const qtui::DialogUnits du(w.font());
+            EXPECT_EQ(w.size(), du.size(319, 202));
+            EXPECT_EQ(w.palette().color(QPalette::Window), QColor(232, 232, 232));
+            struct Expected {
+                int id;
+                const char* label;
+                QRect units;
+            };
+            for (const auto& e : {Expected{1, "E&xit", {216, 113, 96, 26}},
+                                  Expected{1000, "&Run Characterization", {8, 113, 96, 26}},
+                                  Expected{1001, "&Abort Cal", {112, 113, 96, 26}},
+                                  Expected{1002, "&Select All", {216, 50, 96, 26}},
+                                  Expected{1003, "C&lear All", {216, 81, 96, 26}},
+                                  Expected{1022, "", {199, 7, 7, 16}}}) {
+                auto* button = control<QPushButton>(w, e.id);
+                ASSERT_NE(button, nullptr);
+                EXPECT_EQ(button->text(), e.label) << e.id;
+                EXPECT_EQ(button->geometry(),
+                          du.rect(e.units.x(), e.units.y(), e.units.width(), e.units.height()))
+                    << e.id;
+            }
+            EXPECT_TRUE(control<QPushButton>(w, 1)->isDefault());
+            EXPECT_FALSE(control<QPushButton>(w, 1001)->isEnabled());
+            EXPECT_TRUE(control<QPushButton>(w, 1000)->isEnabled());
 
-                auto* log = control<QPlainTextEdit>(w, 1004);
-                EXPECT_TRUE(log->isReadOnly());
-                EXPECT_EQ(log->geometry(), du.rect(7, 147, 305, 48));
-                EXPECT_EQ(log->lineWrapMode(), QPlainTextEdit::NoWrap);
-                EXPECT_EQ(
-                    log->toPlainText(),
-                    "This Characterization will run in two parts: first R channels, then port "
-                    "receivers.\nAccessories you will need:\n"
-                    "1)  RF cable with 3.5mm connectors (F-F)\n"
-                    "2)  3.5mm pad(s) totalling approximately 20dB\n");
+            auto* log = control<QPlainTextEdit>(w, 1004);
+            EXPECT_TRUE(log->isReadOnly());
+            EXPECT_EQ(log->geometry(), du.rect(7, 147, 305, 48));
+            EXPECT_EQ(log->lineWrapMode(), QPlainTextEdit::NoWrap);
+            EXPECT_EQ(log->toPlainText(),
+                      "This Characterization will run in two parts: first R channels, then port "
+                      "receivers.\nAccessories you will need:\n"
+                      "1)  RF cable with 3.5mm connectors (F-F)\n"
+                      "2)  3.5mm pad(s) totalling approximately 20dB\n");
 
-                auto* list = control<QListWidget>(w, 1005);
-                EXPECT_EQ(list->selectionMode(), QAbstractItemView::MultiSelection);
-                EXPECT_EQ(list->geometry(), du.rect(7, 22, 198, 86));
-                QStringList names;
-                for (int i = 0; i < list->count(); ++i) {
-                    names << list->item(i)->text();
-                    EXPECT_TRUE(list->item(i)->isSelected()) << i;
-                }
-                QStringList expected;
-                for (const auto& name : w.controller()->receivers()) {
-                    expected << QString::fromStdString(name);
-                }
-                EXPECT_EQ(names, expected);
-                EXPECT_TRUE(names.contains("R1"));
-                EXPECT_TRUE(names.contains("A"));
+            auto* list = control<QListWidget>(w, 1005);
+            EXPECT_EQ(list->selectionMode(), QAbstractItemView::MultiSelection);
+            EXPECT_EQ(list->geometry(), du.rect(7, 22, 198, 86));
+            QStringList names;
+            for (int i = 0; i < list->count(); ++i) {
+                names << list->item(i)->text();
+                EXPECT_TRUE(list->item(i)->isSelected()) << i;
+            }
+            QStringList expected;
+            for (const auto& name : w.controller()->receivers()) {
+                expected << QString::fromStdString(name);
+            }
+            EXPECT_EQ(names, expected);
+            EXPECT_TRUE(names.contains("R1"));
+            EXPECT_TRUE(names.contains("A"));
 
-                auto* prompt = w.findChild<QLabel*>("selectPrompt");
-                ASSERT_NE(prompt, nullptr);
-                EXPECT_EQ(prompt->text(), "Please select the receivers to characterize  ");
-                EXPECT_EQ(prompt->geometry(), du.rect(12, 9, 176, 8));
+            auto* prompt = w.findChild<QLabel*>("selectPrompt");
+            ASSERT_NE(prompt, nullptr);
+            EXPECT_EQ(prompt->text(), "Please select the receivers to characterize  ");
+            EXPECT_EQ(prompt->geometry(), du.rect(12, 9, 176, 8));
 
-                const auto actions = w.windowMenu().actions();
-                ASSERT_GE(actions.size(), 2);
-                EXPECT_TRUE(actions[actions.size() - 2]->isSeparator());
-                EXPECT_EQ(actions.back()->text(), "&About Receiver Characterization...");
-                EXPECT_FALSE(w.windowIcon().isNull());
-                EXPECT_FALSE(w.runTimer().isActive());
-                click(w, 1);
-            });
-        op.start();
+            const auto actions = w.windowMenu().actions();
+            ASSERT_GE(actions.size(), 2);
+            EXPECT_TRUE(actions[actions.size() - 2]->isSeparator());
+            EXPECT_EQ(actions.back()->text(), "&About Receiver Characterization...");
+            EXPECT_FALSE(w.windowIcon().isNull());
+            EXPECT_FALSE(w.runTimer().isActive());
+            click(w, 1);
+        });
     });
-    EXPECT_EQ(status, 0);
-    EXPECT_TRUE(op.allStepsDone());
     // Exit without a run: no question and no restart.
     EXPECT_TRUE(op.seen().empty());
     EXPECT_FALSE(bench.signals.restartRequested);
@@ -152,49 +179,31 @@ TEST(QtMainWindow, SelectAllClearAllAndTheAboutBoxFromTheWindowMenu) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
     QString aboutVersion;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
+    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
+        whenIdle(op, w, [&] {
+            click(w, 1003);
+            EXPECT_TRUE(w.controller()->selectedReceivers().empty());
+            EXPECT_TRUE(control<QListWidget>(w, 1005)->selectedItems().isEmpty());
+            clickReceiver(w, "A");
+            EXPECT_EQ(w.controller()->selectedReceivers(), std::vector<std::string>{"A"});
+            click(w, 1002);
+            EXPECT_EQ(control<QListWidget>(w, 1005)->selectedItems().size(),
+                      control<QListWidget>(w, 1005)->count());
+            w.aboutAction().trigger();
+        });
         op.then(
-            "the idle dialog", [&] { return idle(w); },
+            "the About box", [] { return visibleAbout() != nullptr; },
             [&] {
-                click(w, 1003);
-                EXPECT_TRUE(w.controller()->selectedReceivers().empty());
-                EXPECT_TRUE(control<QListWidget>(w, 1005)->selectedItems().isEmpty());
-                clickReceiver(w, "A");
-                EXPECT_EQ(w.controller()->selectedReceivers(), std::vector<std::string>{"A"});
-                click(w, 1002);
-                EXPECT_EQ(control<QListWidget>(w, 1005)->selectedItems().size(),
-                          control<QListWidget>(w, 1005)->count());
-                w.aboutAction().trigger();
-            });
-        op.then(
-            "the About box",
-            [] {
-                for (auto* widget : QApplication::topLevelWidgets()) {
-                    if (qobject_cast<qtui::QtAboutDialog*>(widget) && widget->isVisible()) {
-                        return true;
-                    }
-                }
-                return false;
-            },
-            [&] {
-                for (auto* widget : QApplication::topLevelWidgets()) {
-                    if (auto* about = qobject_cast<qtui::QtAboutDialog*>(widget)) {
-                        EXPECT_EQ(about->windowTitle(), "About Receiver Characterization");
-                        EXPECT_TRUE(about->isModal());
-                        aboutVersion =
-                            qobject_cast<QLabel*>(qtui::controlById(*about, 1006))->text();
-                        qobject_cast<QPushButton*>(qtui::controlById(*about, 1))->click();
-                    }
-                }
+                auto* about = visibleAbout();
+                EXPECT_EQ(about->windowTitle(), "About Receiver Characterization");
+                EXPECT_TRUE(about->isModal());
+                aboutVersion = qobject_cast<QLabel*>(qtui::controlById(*about, 1006))->text();
+                qobject_cast<QPushButton*>(qtui::controlById(*about, 1))->click();
             });
         op.then(
             "the About box closed", [&] { return idle(w) && !QApplication::activeModalWidget(); },
             [&] { click(w, 1); });
-        op.start();
     });
-    EXPECT_EQ(status, 0);
-    EXPECT_TRUE(op.allStepsDone());
     EXPECT_EQ(aboutVersion, "13.55.06.0");
 }
 
@@ -204,16 +213,8 @@ TEST(QtMainWindow, TracedExampleRunsThroughTheWindowAndPlotsEachReceiver) {
     op.answerOthersByDefault();
     QString log;
     QStringList plotted;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
-        op.then(
-            "the idle dialog", [&] { return idle(w); },
-            [&] {
-                click(w, 1003);
-                clickReceiver(w, "R1");
-                clickReceiver(w, "A");
-                click(w, 1000);
-            });
+    runWindow(bench, op, [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
+        whenIdle(op, w, [&] { runOnly(w, {"R1", "A"}); });
         op.then(
             "the completion notice",
             [&] {
@@ -229,10 +230,7 @@ TEST(QtMainWindow, TracedExampleRunsThroughTheWindowAndPlotsEachReceiver) {
                 EXPECT_FALSE(w.runTimer().isActive());
                 click(w, 1);
             });
-        op.start();
     });
-    EXPECT_EQ(status, 0);
-    ASSERT_TRUE(op.allStepsDone());
     expectInOrder(op.captions(),
                   {"Some Cals Deferred", "Connections", "Reload TVA cals and continue now?",
                    "Reload now?", "Connections"});
@@ -264,15 +262,8 @@ TEST(QtMainWindow, AbortStaysUsableWhileAWorkerBoxIsOpen) {
     op.answer("Abort now?", {QMessageBox::Yes});
     op.hold("Connections");
     QString logAfterAbort;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
-        op.then(
-            "the idle dialog", [&] { return idle(w); },
-            [&] {
-                click(w, 1003);
-                clickReceiver(w, "R1");
-                click(w, 1000);
-            });
+    runWindow(bench, op, [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
+        whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
         op.then(
             "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
             [&] {
@@ -292,10 +283,7 @@ TEST(QtMainWindow, AbortStaysUsableWhileAWorkerBoxIsOpen) {
             });
         op.then(
             "the aborted run", [&] { return idle(w); }, [&] { click(w, 1); });
-        op.start();
     });
-    EXPECT_EQ(status, 0);
-    ASSERT_TRUE(op.allStepsDone());
     expectInOrder(op.captions(), {"Connections", "Abort now?"});
     EXPECT_FALSE(logAfterAbort.contains("Characterization Aborted"));
 }
@@ -307,19 +295,12 @@ TEST(QtMainWindow, CloseDuringARunEndsOnlyAfterTheWorkerHasStopped) {
     op.hold("Connections");
     bool workerRunningAtEnd = true;
     QString finalLog;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
+    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
         QObject::connect(&w, &TarvexWindow::dialogEnded, [&] {
             workerRunningAtEnd = w.controller()->workerRunning();
             finalLog = logOf(w);
         });
-        op.then(
-            "the idle dialog", [&] { return idle(w); },
-            [&] {
-                click(w, 1003);
-                clickReceiver(w, "R1");
-                click(w, 1000);
-            });
+        whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
         op.then(
             "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
             [&] { w.close(); });
@@ -331,10 +312,7 @@ TEST(QtMainWindow, CloseDuringARunEndsOnlyAfterTheWorkerHasStopped) {
                 EXPECT_TRUE(w.controller()->workerRunning());
                 op.release();
             });
-        op.start();
     });
-    EXPECT_EQ(status, 0);
-    ASSERT_TRUE(op.allStepsDone());
     EXPECT_FALSE(workerRunningAtEnd);
     EXPECT_TRUE(finalLog.contains("Aborting Characterization\nCharacterization Aborted\n"))
         << finalLog.toStdString();
@@ -346,15 +324,8 @@ TEST(QtMainWindow, BadDataDialogRetestShowsPleaseNoteAndMeasuresAgain) {
     op.answerOthersByDefault();
     op.badData({1011});
     QString log;
-    int status = bench.run([&](qtui::QtFrontEndParts& parts) {
-        TarvexWindow& w = parts.window;
-        op.then(
-            "the idle dialog", [&] { return idle(w); },
-            [&] {
-                click(w, 1003);
-                clickReceiver(w, "R1");
-                click(w, 1000);
-            });
+    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
+        whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
         op.then(
             "the end of the run",
             [&] { return idle(w) && logOf(w).contains("All requested cals complete"); },
@@ -362,10 +333,7 @@ TEST(QtMainWindow, BadDataDialogRetestShowsPleaseNoteAndMeasuresAgain) {
                 log = logOf(w);
                 click(w, 1);
             });
-        op.start();
     });
-    EXPECT_EQ(status, 0);
-    ASSERT_TRUE(op.allStepsDone());
     expectInOrder(op.captions(), {"Characterization data issue!", "Please Note"});
     for (const auto& box : op.seen()) {
         if (box.caption == "Please Note") {
