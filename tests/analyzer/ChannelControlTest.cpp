@@ -110,14 +110,9 @@ TEST_F(ProxyTest, SegmentTableSwitchesBandwidthAndPower) {
                 ElementsAre("channel.setSweepType(4)", "channel.setIfBandwidth(1000)",
                             "scpi SOUR:POW -20,\"PORT 1\"", "segments.writeTable(3)"));
     ASSERT_EQ(fake.segmentTable->rows.size(), 3u);
-    const auto& row = fake.segmentTable->rows[0];
-    EXPECT_EQ(row.on, 1);
-    EXPECT_EQ(row.points, 21.9);
-    EXPECT_EQ(row.start, 1e8);
-    EXPECT_EQ(row.stop, 1e9);
-    EXPECT_EQ(row.ifBandwidth, 1000);
-    EXPECT_EQ(row.reserved, 0);
-    EXPECT_EQ(row.power, -20);
+    const auto& r = fake.segmentTable->rows[0];
+    EXPECT_THAT((std::vector{r.on, r.points, r.start, r.stop, r.ifBandwidth, r.reserved, r.power}),
+                ElementsAre(1, 21.9, 1e8, 1e9, 1000, 0, -20));
     EXPECT_EQ(fake.segmentTable->rows[2].start, 1e10);
     EXPECT_EQ(proxy->readnumberofpoints(false), 21 + 31 + 41);
 
