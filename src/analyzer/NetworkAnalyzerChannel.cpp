@@ -127,20 +127,21 @@ void CNetworkAnalyzer::setattenuator(const std::string& mode, int port) {
     }
 }
 
-void CNetworkAnalyzer::setpathelement(const std::string& spec) {
+void CNetworkAnalyzer::setpathelement(const std::string& elements) {
     std::string::size_type begin = 0;
-    for (auto slash = spec.find('/'); slash != std::string::npos; slash = spec.find('/', begin)) {
-        const std::string item = spec.substr(begin, slash - begin);
+    for (auto slash = elements.find('/'); slash != std::string::npos;
+         slash = elements.find('/', begin)) {
+        const std::string item = elements.substr(begin, slash - begin);
         const auto comma = item.find(',');
         if (comma == std::string::npos) {
             throw std::string("CNetworkAnalyzer::setpathelement: the item \"" + item + "\" of \"" +
-                              spec + "\" is not an element name, a comma and a value");
+                              elements + "\" is not an element name, a comma and a value");
         }
         sendscpi("sense:path:conf:elem \"" + item.substr(0, comma) + "\",\"" +
                  item.substr(comma + 1) + "\"");
         begin = slash + 1;
     }
-    const std::string last = spec.substr(begin);
+    const std::string last = elements.substr(begin);
     if (const auto dialog = last.find("Dialog"); dialog != std::string::npos) {
         m_pathDescription = last.substr(0, dialog);
     } else if (m_pathDescription.find(last) == std::string::npos) {

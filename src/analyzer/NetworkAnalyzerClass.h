@@ -62,13 +62,13 @@ class CNetworkAnalyzer {
     // mode "auto" or "manual" (any case); port from 1 to the port count.
     void setattenuator(const std::string& mode, int port);
     // "element,value/element,value/.../description": sends every element but the last item.
-    void setpathelement(const std::string& spec);
+    void setpathelement(const std::string& elements);
     // One segment per index first..last of the lists (last 0 means the last list entry).
     // The cached number of points becomes the sum of the segments' points.
     void setsegments(const std::vector<double>& starts, const std::vector<double>& stops,
                      const std::vector<double>& points, const std::vector<double>& bandwidths,
                      const std::vector<double>& powers, int first, int last);
-    // third is unused; fourth is a path specification for setpathelement or "None Set".
+    // third is unused; fourth is a path element list for setpathelement or "None Set".
     void definemeasurement(std::string receiver, std::string port, const std::string& third,
                            std::string fourth, bool force);
     std::string readmeasurementname(bool query);

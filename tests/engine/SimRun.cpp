@@ -1,4 +1,5 @@
 #include "SimRun.h"
+#include "SentCommands.h"
 
 namespace enginetest {
 
@@ -61,13 +62,7 @@ std::vector<std::string> SimRun::notices() const {
 }
 
 std::vector<std::string> SimRun::commands() const {
-    std::vector<std::string> sent;
-    for (const auto& line : simulator->transcript()) {
-        if (line.rfind("> ", 0) == 0 && line != "> SYST:ERR?") {
-            sent.push_back(line.substr(2));
-        }
-    }
-    return sent;
+    return testsupport::sentCommands(*simulator);
 }
 
 }  // namespace enginetest

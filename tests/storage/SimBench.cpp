@@ -1,4 +1,5 @@
 #include "SimBench.h"
+#include "SentCommands.h"
 
 #include <gtest/gtest.h>
 
@@ -21,13 +22,7 @@ SimBench::SimBench(const std::string& scenarioMembers)
 }
 
 std::vector<std::string> SimBench::commands() const {
-    std::vector<std::string> sent;
-    for (const auto& line : simulator->transcript()) {
-        if (line.rfind("> ", 0) == 0 && line != "> SYST:ERR?") {
-            sent.push_back(line.substr(2));
-        }
-    }
-    return sent;
+    return testsupport::sentCommands(*simulator);
 }
 
 std::vector<std::string> SimBench::logLines() const {
