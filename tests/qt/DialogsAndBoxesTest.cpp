@@ -203,6 +203,10 @@ TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
         }
         return dialog != nullptr;
     }));
+    // Another window being active must not take the note over.
+    QWidget elsewhere;
+    elsewhere.show();
+    QApplication::setActiveWindow(&elsewhere);
     QWidget* owner = nullptr;
     QTimer::singleShot(20, [&] {
         QMessageBox* note = visibleBox("Please Note");
@@ -210,7 +214,6 @@ TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
         owner = note->parentWidget();
         note->button(QMessageBox::Ok)->click();
     });
-    dialog->activateWindow();
     button(*dialog, 1011)->click();
     EXPECT_EQ(choice.get(), BadDataChoice::Retest);
     EXPECT_EQ(owner, dialog);

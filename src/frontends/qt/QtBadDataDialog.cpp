@@ -3,6 +3,7 @@
 #include <QLabel>
 #include <QPushButton>
 
+#include "frontends/qt/BoxOwnerScope.h"
 #include "frontends/qt/ControlIds.h"
 #include "frontends/qt/DialogUnits.h"
 #include "frontends/qt/Palette.h"
@@ -51,6 +52,7 @@ QtBadDataDialog::QtBadDataDialog(app::RcvrCharBadDlg& model, platform::OperatorU
 }
 
 void QtBadDataDialog::press(platform::BadDataChoice button) {
+    const BoxOwnerScope ownBoxes(this);
     m_model.press(button, m_ui);
     accept();
 }

@@ -8,6 +8,7 @@
 #include <optional>
 
 #include "app/RcvrCharBadDlg.h"
+#include "frontends/qt/BoxOwnerScope.h"
 #include "frontends/qt/ProgramIcon.h"
 #include "frontends/qt/QtBadDataDialog.h"
 
@@ -52,6 +53,9 @@ bool QtOperatorUi::onUiThread() const {
 }
 
 QWidget* QtOperatorUi::uiOwner() const {
+    if (auto* named = BoxOwnerScope::current()) {
+        return named;
+    }
     if (auto* modal = QApplication::activeModalWidget()) {
         return modal;
     }
