@@ -55,6 +55,10 @@ bool characterizeReceiver(RunContext& context, SweepContext& sweep,
                        segment.last, static_cast<int>(s));
         for (int k = 0; k < count; ++k) {
             sweep.checkabort();
+            if (context.signals.onStep) {
+                context.signals.onStep({name, static_cast<int>(s) + 1,
+                                        static_cast<int>(segments.size()), k + 1, count});
+            }
             measurePowerLevel(sweep, ladder[k], k, segment.first, segment.last);
             if (s + 1 == segments.size() && count - k - 1 == 5) {
                 context.notices.postnotice("Almost Done with Cal\r\n");

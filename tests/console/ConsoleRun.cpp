@@ -44,8 +44,16 @@ int ConsoleRun::runYes(const std::string& script) {
     return runWith(script, true, "");
 }
 
-int ConsoleRun::runWith(const std::string& script, bool yes, const std::string& answers) {
-    console::ConsoleSetup setup{
+int ConsoleRun::runInteractive(console::LineSource& keyboard, std::ostream& out) {
+    console::ConsoleSetup setup = makeSetup();
+    std::ostringstream err;
+    const int status = console::runInteractive(setup, keyboard, out, err);
+    m_err = err.str();
+    return status;
+}
+
+console::ConsoleSetup ConsoleRun::makeSetup() {
+    return {
         *m_clock,
         *m_paths,
         *m_processes,
@@ -55,6 +63,10 @@ int ConsoleRun::runWith(const std::string& script, bool yes, const std::string& 
             return std::make_shared<sim::SimulatedBench>(frontEnd, *m_simulator);
         },
     };
+}
+
+int ConsoleRun::runWith(const std::string& script, bool yes, const std::string& answers) {
+    console::ConsoleSetup setup = makeSetup();
     std::ostringstream out;
     std::ostringstream err;
     const int status = console::runScripted(

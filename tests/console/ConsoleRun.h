@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "TempDir.h"
+#include "frontends/console/ConsoleFrontEnd.h"
 #include "platform/Clock.h"
 #include "platform/PathMap.h"
 #include "platform/RunSignals.h"
@@ -30,6 +31,8 @@ class ConsoleRun {
     // Runs the script with the answers file text (or --yes); returns the exit status.
     int run(const std::string& script, const std::string& answers);
     int runYes(const std::string& script);
+    // The interactive front end, typed at by keyboard; writes to out, keeps the errors.
+    int runInteractive(console::LineSource& keyboard, std::ostream& out);
 
     const std::string& out() const { return m_out; }
     const std::string& err() const { return m_err; }
@@ -42,6 +45,7 @@ class ConsoleRun {
     platform::VirtualClock& clock() { return *m_clock; }
 
   private:
+    console::ConsoleSetup makeSetup();
     int runWith(const std::string& script, bool yes, const std::string& answers);
 
     TempDir m_dir;

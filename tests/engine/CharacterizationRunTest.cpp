@@ -57,7 +57,19 @@ TEST(CharacterizationRun, AlmostDoneNeedsMoreThanFiveLevels) {
 
 TEST(CharacterizationRun, ReferenceReceiverIsMeasuredInTwoSegmentsWithTheirOwnCabling) {
     SimRun sim;
+    std::vector<std::tuple<std::string, int, int, int, int>> steps;
+    sim.signals.onStep = [&steps](const platform::RunStep& step) {
+        steps.emplace_back(step.receiver, step.segment, step.segments, step.level, step.levels);
+    };
     ASSERT_EQ(sim.run({"R1"}), 0);
+    // Every level of both segments is announced before it is measured, in order.
+    const int levels = static_cast<int>(steps.size()) / 2;
+    ASSERT_GT(levels, 5);
+    for (int i = 0; i < 2 * levels; ++i) {
+        EXPECT_EQ(steps[static_cast<std::size_t>(i)],
+                  std::make_tuple("R1", 1 + i / levels, 2, 1 + i % levels, levels))
+            << i;
+    }
     // Bands 2..6 with the break at band 5: bands 2-4 with the pad, 5-6 with the delay line.
     const auto boxes = sim.ui.boxes();
     std::vector<std::string> connections;

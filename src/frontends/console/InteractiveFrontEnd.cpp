@@ -18,11 +18,21 @@ constexpr const char* kHelp =
     "A box asks for its answer at its prompt; a box of the running characterization\n"
     "can wait while you type abort.\n";
 
+std::string progressLine(const platform::RunStep& step) {
+    return "  -- " + step.receiver + ": segment " + std::to_string(step.segment) + " of " +
+           std::to_string(step.segments) + ", power level " + std::to_string(step.level) + " of " +
+           std::to_string(step.levels) + "\n";
+}
+
 class InteractiveLoop {
   public:
     InteractiveLoop(ConsoleSession& session, InteractiveAnswerer& answerer, LineSource& input,
-                    std::atomic<bool>* closeRequested)
-        : m_session(session), m_answerer(answerer), m_input(input), m_close(closeRequested) {}
+                    std::atomic<bool>* closeRequested, platform::RunSignals& signals)
+        : m_session(session),
+          m_answerer(answerer),
+          m_input(input),
+          m_close(closeRequested),
+          m_signals(signals) {}
 
     void run(app::CTarvexDlg& dlg) {
         struct ReleaseWorkerBoxes {
@@ -31,10 +41,16 @@ class InteractiveLoop {
         } release{m_answerer};
 
         m_session.view().setNoticeHook([this](const std::string& text) { progress(text); });
+        // The dialog has ended, and its worker with it, before these are reset.
+        m_signals.onStep = [this](const platform::RunStep& step) { showStep(step); };
         struct HookReset {
             ConsoleView& view;
-            ~HookReset() { view.setNoticeHook(nullptr); }
-        } reset{m_session.view()};
+            platform::RunSignals& signals;
+            ~HookReset() {
+                view.setNoticeHook(nullptr);
+                signals.onStep = nullptr;
+            }
+        } reset{m_session.view(), m_signals};
 
         m_session.output().write(m_session.view().listText() + kHelp);
         bool exitPressed = false;
@@ -77,6 +93,16 @@ class InteractiveLoop {
                                      " of this run, " + std::to_string(seconds.count()) +
                                      " s so far\n");
         }
+    }
+
+    // Worker thread. A line for each new segment, and otherwise at most one a second.
+    void showStep(const platform::RunStep& step) {
+        const auto now = std::chrono::steady_clock::now();
+        if (step.level != 1 && now - m_stepShownAt < std::chrono::seconds(1)) {
+            return;
+        }
+        m_stepShownAt = now;
+        m_session.output().write(progressLine(step));
     }
 
     void command(app::CTarvexDlg& dlg, const std::string& line) {
@@ -186,7 +212,10 @@ class InteractiveLoop {
     InteractiveAnswerer& m_answerer;
     LineSource& m_input;
     std::atomic<bool>* m_close;
+    platform::RunSignals& m_signals;
     int m_started = 0;
+    // Used by the worker thread only.
+    std::chrono::steady_clock::time_point m_stepShownAt;
     std::chrono::steady_clock::time_point m_runBegan = std::chrono::steady_clock::now();
 };
 
@@ -198,7 +227,7 @@ int runInteractive(ConsoleSetup& setup, LineSource& input, std::ostream& out, st
     app::UiTaskQueue queue;
     InteractiveAnswerer answerer(output, queue, input);
     ConsoleSession session(setup, output, queue, answerer, true);
-    InteractiveLoop loop(session, answerer, input, closeRequested);
+    InteractiveLoop loop(session, answerer, input, closeRequested, setup.signals);
     return session.run([&](app::CTarvexDlg& dlg) { loop.run(dlg); });
 }
 
