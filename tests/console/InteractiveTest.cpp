@@ -120,12 +120,16 @@ bool inOrder(const std::string& text, const std::vector<std::string>& expected) 
 
 TEST(ThreadedInteractiveConsole, TypedCommandsRunAReceiverWithProgressAndExit) {
     Session session;
-    const std::string screen = session.type(
-        {{"", "clear"}, {"", "select R1"}, {"", "run"}, {"All requested cals complete", "exit"}});
+    const std::string screen = session.type({{"", "abort"},
+                                             {"", "clear"},
+                                             {"", "select R1"},
+                                             {"", "run"},
+                                             {"All requested cals complete", "exit"}});
     EXPECT_EQ(session.status, 0) << session.run.err() << screen;
     EXPECT_TRUE(inOrder(
-        screen, {"Commands: run, abort", "Started Cal R1", "[Connections] ", "  answer OK > ",
-                 "  => OK\n", "  -- R1: segment 1 of 2, power level 1 of ", "[Connections] ",
+        screen, {"Commands: run, abort", "the Abort button is disabled when no run is active\n",
+                 "Started Cal R1", "[Connections] ", "  answer OK > ", "  => OK\n",
+                 "  -- R1: segment 1 of 2, power level 1 of ", "[Connections] ",
                  "  -- R1: segment 2 of 2, power level 1 of ", "Cal Complete",
                  "[Exit without finishing cal?] ", "  => Yes\n"}))
         << screen;

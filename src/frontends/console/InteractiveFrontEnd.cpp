@@ -5,6 +5,7 @@
 
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "frontends/console/ConsoleSession.h"
+#include "frontends/console/DialogButtons.h"
 #include "frontends/console/InteractiveAnswerer.h"
 #include "frontends/console/TextLines.h"
 
@@ -136,48 +137,14 @@ class InteractiveLoop {
             m_session.output().write(reason + "\n");
             return;
         }
-        using Kind = ScriptAction::Kind;
-        switch (action.kind) {
-            case Kind::SelectAll:
-                dlg.onSelectAll();
-                break;
-            case Kind::Clear:
-                dlg.onClearAll();
-                break;
-            case Kind::Select:
-                for (const auto& name : action.names) {
-                    select(dlg, name, true);
-                }
-                break;
-            case Kind::Run:
-                if (dlg.runEnabled()) {
-                    dlg.onRun();
-                } else {
-                    m_session.output().write("Run is disabled while a run is active\n");
-                }
-                break;
-            case Kind::Wait:
-                m_session.output().write("wait is for scripts; the log shows the run\n");
-                break;
-            case Kind::Export:
-                dlg.onExport();
-                break;
-            case Kind::About:
-                dlg.onAbout();
-                break;
-            case Kind::Abort:
-                if (dlg.abortEnabled()) {
-                    dlg.onAbort();
-                } else {
-                    m_session.output().write("Abort is disabled: no run is active\n");
-                }
-                break;
-            case Kind::Exit:
-                dlg.onExit();
-                break;
-            case Kind::Close:
-                dlg.onClose();
-                break;
+        if (action.kind == ScriptAction::Kind::Select) {
+            for (const auto& name : action.names) {
+                select(dlg, name, true);
+            }
+        } else if (action.kind == ScriptAction::Kind::Wait) {
+            m_session.output().write("wait is for scripts; the log shows the run\n");
+        } else if (auto disabled = pressButton(dlg, action.kind)) {
+            m_session.output().write(*disabled + "\n");
         }
     }
 

@@ -4,6 +4,7 @@
 
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "frontends/console/ConsoleSession.h"
+#include "frontends/console/DialogButtons.h"
 #include "frontends/console/ScriptedAnswerer.h"
 
 namespace console {
@@ -69,46 +70,12 @@ class ScriptPlayer {
     }
 
     void perform(app::CTarvexDlg& dlg, const ScriptLine& line) {
-        const ScriptAction& action = line.action;
-        switch (action.kind) {
-            case Kind::SelectAll:
-                dlg.onSelectAll();
-                break;
-            case Kind::Clear:
-                dlg.onClearAll();
-                break;
-            case Kind::Select:
-                select(dlg, line);
-                break;
-            case Kind::Run:
-                if (dlg.runEnabled()) {
-                    dlg.onRun();
-                } else {
-                    ignored(line, "the Run button is disabled while a run is active");
-                }
-                break;
-            case Kind::Wait:
-                m_session.settle(dlg);
-                break;
-            case Kind::Export:
-                dlg.onExport();
-                break;
-            case Kind::About:
-                dlg.onAbout();
-                break;
-            case Kind::Abort:
-                if (dlg.abortEnabled()) {
-                    dlg.onAbort();
-                } else {
-                    ignored(line, "the Abort button is disabled when no run is active");
-                }
-                break;
-            case Kind::Exit:
-                dlg.onExit();
-                break;
-            case Kind::Close:
-                dlg.onClose();
-                break;
+        if (line.action.kind == Kind::Select) {
+            select(dlg, line);
+        } else if (line.action.kind == Kind::Wait) {
+            m_session.settle(dlg);
+        } else if (auto disabled = pressButton(dlg, line.action.kind)) {
+            ignored(line, *disabled);
         }
     }
 
