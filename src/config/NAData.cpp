@@ -4,23 +4,11 @@
 
 #include "config/ConfigurationFile.h"
 #include "config/NumberText.h"
+#include "config/Split.h"
 #include "config/TextMatch.h"
 #include "platform/NumberText.h"
 
 namespace {
-
-// A sub-step cell lists positions separated by commas; an empty piece is position 0.
-std::vector<std::string> SplitPositions(const std::string& cell) {
-    std::vector<std::string> pieces;
-    std::size_t start = 0;
-    for (std::size_t comma = cell.find(','); comma != std::string::npos;
-         comma = cell.find(',', start)) {
-        pieces.push_back(cell.substr(start, comma - start));
-        start = comma + 1;
-    }
-    pieces.push_back(cell.substr(start));
-    return pieces;
-}
 
 // Calibrations with short names have their sub-step column headed "Rec-" + name.
 std::string SubColumnKey(const std::string& calibrationName) {
@@ -208,7 +196,7 @@ void CNAData::ReadSequence(const std::string& path) {
             if (cells[row] == "0") {
                 continue;
             }
-            for (const auto& position : SplitPositions(cells[row])) {
+            for (const auto& position : SplitAtCommas(cells[row])) {
                 CSub sub(subNames[row]);
                 sub.SetPosition(platform::leadingInteger(position));
                 sub.SetIFBW(platform::leadingInteger(ifbws[row]));

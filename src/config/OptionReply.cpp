@@ -1,14 +1,11 @@
 #include "config/OptionReply.h"
 
+#include "config/Split.h"
+
 std::vector<std::string> SplitOptionReply(const std::string& reply) {
-    std::vector<std::string> options;
-    std::size_t pos = 0;
-    for (std::size_t comma = reply.find(','); comma != std::string::npos;
-         comma = reply.find(',', pos)) {
-        options.push_back(reply.substr(pos, comma - pos));
-        pos = comma + 1;
+    std::vector<std::string> options = SplitAtCommas(reply);
+    if (options.back().empty()) {
+        options.back() = "No Options";
     }
-    std::string rest = reply.substr(pos);
-    options.push_back(rest.empty() ? "No Options" : rest);
     return options;
 }

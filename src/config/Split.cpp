@@ -35,3 +35,15 @@ int Split(const std::string& text, std::vector<std::string>& tokens, const std::
 int SplitWords(const std::string& text, std::vector<std::string>& words) {
     return Split(text, words, " \t", '"');
 }
+
+std::vector<std::string> SplitAtCommas(const std::string& text) {
+    std::vector<std::string> pieces;
+    std::size_t start = 0;
+    for (std::size_t comma = text.find(','); comma != std::string::npos;
+         comma = text.find(',', start)) {
+        pieces.push_back(text.substr(start, comma - start));
+        start = comma + 1;
+    }
+    pieces.push_back(text.substr(start));
+    return pieces;
+}

@@ -11,3 +11,6 @@ int Split(const std::string& text, std::vector<std::string>& tokens, const std::
 
 // Split at blanks and tabs, with double quotes grouping.
 int SplitWords(const std::string& text, std::vector<std::string>& words);
+
+// Every piece between commas, empty ones included: "a,,b," gives "a", "", "b", "".
+std::vector<std::string> SplitAtCommas(const std::string& text);
