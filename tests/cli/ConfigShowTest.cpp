@@ -1,36 +1,23 @@
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <nlohmann/json.hpp>
 
-#include "TempDir.h"
+#include "RunRcvrchar.h"
 
 namespace {
 
-struct CommandResult {
-    int status;
-    std::string out;
-    std::string err;
-};
+using clitest::CommandRun;
 
-// Runs the built executable with arguments (already shell-quoted) from directory dir.
-CommandResult runConfigShow(const testsupport::TempDir& dir, const std::string& arguments) {
-    std::string command = "cd '" + dir.path().string() +
-                          "' && '" RCVRCHAR_BINARY_DIR "/bin/rcvrchar' config show " + arguments +
-                          " >out.txt 2>err.txt";
-    int raw = std::system(command.c_str());
-    return {WIFEXITED(raw) ? WEXITSTATUS(raw) : -1, testsupport::readFile(dir / "out.txt"),
-            testsupport::readFile(dir / "err.txt")};
+CommandRun runConfigShow(const testsupport::TempDir& dir, const std::string& arguments) {
+    return clitest::runRcvrchar(dir, "config show " + arguments);
 }
 
-std::string sample() {
-    return "'" + testsupport::sampleConfiguration().string() + "'";
-}
+using clitest::quotedSample;
 
 TEST(ConfigShow, DefaultAnalyzerAsTheDialogSeesIt) {
     testsupport::TempDir dir;
-    CommandResult run =
-        runConfigShow(dir, "--file " + sample() + " --model T3872A --options 010,080");
+    CommandRun run =
+        runConfigShow(dir, "--file " + quotedSample() + " --model T3872A --options 010,080");
     ASSERT_EQ(run.status, 0) << run.err;
     EXPECT_EQ(run.err, "");
     auto json = nlohmann::ordered_json::parse(run.out);
@@ -72,7 +59,7 @@ TEST(ConfigShow, FileDefaultsToWorkingDirectoryAndOptionsToNone) {
     testsupport::TempDir dir;
     testsupport::writeFile(dir / "RcvrChar.dat",
                            testsupport::readFile(testsupport::sampleConfiguration()));
-    CommandResult run = runConfigShow(dir, "--model T3871B");
+    CommandRun run = runConfigShow(dir, "--model T3871B");
     ASSERT_EQ(run.status, 0) << run.err;
     auto json = nlohmann::json::parse(run.out);
     EXPECT_EQ(json["options"], nlohmann::json({"No Options"}));
@@ -85,17 +72,17 @@ TEST(ConfigShow, FileDefaultsToWorkingDirectoryAndOptionsToNone) {
 
 TEST(ConfigShow, ErrorsGoToStderrAlone) {
     testsupport::TempDir dir;
-    CommandResult missing = runConfigShow(dir, "--model T3872A");
+    CommandRun missing = runConfigShow(dir, "--model T3872A");
     EXPECT_EQ(missing.status, 1);
     EXPECT_EQ(missing.out, "");
     EXPECT_EQ(missing.err, "CNAData::ReadSequence Can't open file RcvrChar.dat\n");
 
-    CommandResult unknown = runConfigShow(dir, "--file " + sample() + " --model T3999A");
+    CommandRun unknown = runConfigShow(dir, "--file " + quotedSample() + " --model T3999A");
     EXPECT_EQ(unknown.status, 1);
     EXPECT_EQ(unknown.out, "");
     EXPECT_EQ(unknown.err, "Table not found: T3999Ain CSV.\n");
 
-    CommandResult noModel = runConfigShow(dir, "--file " + sample());
+    CommandRun noModel = runConfigShow(dir, "--file " + quotedSample());
     EXPECT_EQ(noModel.status, 1);
     EXPECT_EQ(noModel.out, "");
     EXPECT_EQ(noModel.err, "config show needs --model, e.g. --model T3872A\n");

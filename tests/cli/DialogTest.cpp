@@ -1,29 +1,12 @@
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-
-#include "TempDir.h"
+#include "RunRcvrchar.h"
 
 namespace {
 
-struct DialogResult {
-    int status;
-    std::string out;
-    std::string err;
-};
+using clitest::CommandRun;
 
-// Runs the executable's dialog in dir (which gets the sample configuration) with its
-// standard input from stdin.txt, as a run without a terminal.
-DialogResult runDialog(const testsupport::TempDir& dir, const std::string& arguments,
-                       const std::string& input = "") {
-    testsupport::writeFile(dir / "stdin.txt", input);
-    std::string command = "cd '" + dir.path().string() +
-                          "' && '" RCVRCHAR_BINARY_DIR "/bin/rcvrchar' " + arguments +
-                          " <stdin.txt >out.txt 2>err.txt";
-    int raw = std::system(command.c_str());
-    return {WIFEXITED(raw) ? WEXITSTATUS(raw) : -1, testsupport::readFile(dir / "out.txt"),
-            testsupport::readFile(dir / "err.txt")};
-}
+using clitest::runRcvrchar;
 
 std::string scenario(const std::string& name) {
     return "'sim:" RCVRCHAR_SOURCE_DIR "/data/scenarios/" + name + "'";
@@ -40,7 +23,7 @@ class Dialog : public ::testing::Test {
 }  // namespace
 
 TEST_F(Dialog, HelpExplainsEveryOptionWithAnExample) {
-    const DialogResult run = runDialog(m_dir, "--help");
+    const CommandRun run = runRcvrchar(m_dir, "--help");
     ASSERT_EQ(run.status, 0) << run.err;
     for (const char* option : {"--workdir", "--analyzer", "--sim-state", "--clock", "--script",
                                "--answers", "--yes", "--trace"}) {
@@ -51,7 +34,7 @@ TEST_F(Dialog, HelpExplainsEveryOptionWithAnExample) {
 }
 
 TEST_F(Dialog, ScriptFromStandardInputRunsAndLeavesTheRunFilesInTheWorkingDirectory) {
-    const DialogResult run = runDialog(
+    const CommandRun run = runRcvrchar(
         m_dir, "--workdir . --analyzer " + scenario("default.json") + " --yes --trace trace.txt",
         "clear\nselect R1\nrun\nwait\n");
     ASSERT_EQ(run.status, 0) << run.err;
@@ -72,9 +55,9 @@ TEST_F(Dialog, ScriptFromStandardInputRunsAndLeavesTheRunFilesInTheWorkingDirect
 TEST_F(Dialog, StatusFourForAnUnansweredBoxAndOneForAnErrorBox) {
     testsupport::writeFile(m_dir / "script.txt", "clear\nselect R1\nrun\nwait\n");
     testsupport::writeFile(m_dir / "answers.txt", "Reload now? = Yes\n");
-    const DialogResult unanswered =
-        runDialog(m_dir, "--analyzer " + scenario("default.json") +
-                             " --script script.txt --answers answers.txt");
+    const CommandRun unanswered =
+        runRcvrchar(m_dir, "--analyzer " + scenario("default.json") +
+                               " --script script.txt --answers answers.txt");
     EXPECT_EQ(unanswered.status, 4);
     EXPECT_NE(unanswered.err.find("rcvrchar: no answer for the box [Connections] Connect cable to "
                                   "PORT 1.\n"),
@@ -82,23 +65,23 @@ TEST_F(Dialog, StatusFourForAnUnansweredBoxAndOneForAnErrorBox) {
         << unanswered.err;
 
     std::filesystem::remove(m_dir / "RcvrChar.dat");
-    const DialogResult missing =
-        runDialog(m_dir, "--analyzer " + scenario("default.json") + " --yes", "run\n");
+    const CommandRun missing =
+        runRcvrchar(m_dir, "--analyzer " + scenario("default.json") + " --yes", "run\n");
     EXPECT_EQ(missing.status, 1);
     EXPECT_EQ(missing.out, "[Error] CNAData::ReadSequence Can't open file RcvrChar.dat => OK\n");
 }
 
 TEST_F(Dialog, BadCommandLinesAreRefusedWithTheReason) {
-    const DialogResult both = runDialog(m_dir, "--yes --answers a.txt");
+    const CommandRun both = runRcvrchar(m_dir, "--yes --answers a.txt");
     EXPECT_NE(both.status, 0);
     EXPECT_NE(both.err.find("--answers excludes --yes"), std::string::npos) << both.err;
 
-    const DialogResult noFile = runDialog(m_dir, "--script missing.txt --yes");
+    const CommandRun noFile = runRcvrchar(m_dir, "--script missing.txt --yes");
     EXPECT_EQ(noFile.status, 1);
     EXPECT_EQ(noFile.err, "Cannot read the operator script \"missing.txt\"\n");
 
     testsupport::writeFile(m_dir / "bad.txt", "run\ndance\n");
-    const DialogResult badScript = runDialog(m_dir, "--script bad.txt --yes");
+    const CommandRun badScript = runRcvrchar(m_dir, "--script bad.txt --yes");
     EXPECT_EQ(badScript.status, 1);
     EXPECT_EQ(badScript.err,
               "script line 2: unknown action \"dance\" (selectall, clear, select, run, wait, "

@@ -1,26 +1,11 @@
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-
-#include "TempDir.h"
+#include "RunRcvrchar.h"
 
 namespace {
 
-struct CommandRun {
-    int status;
-    std::string out;
-    std::string err;
-};
-
-// Runs the built executable with shell-quoted arguments from inside dir.
-CommandRun rcvrchar(const testsupport::TempDir& dir, const std::string& arguments) {
-    std::string command = "cd '" + dir.path().string() +
-                          "' && '" RCVRCHAR_BINARY_DIR "/bin/rcvrchar' " + arguments +
-                          " >out.txt 2>err.txt";
-    int raw = std::system(command.c_str());
-    return {WIFEXITED(raw) ? WEXITSTATUS(raw) : -1, testsupport::readFile(dir / "out.txt"),
-            testsupport::readFile(dir / "err.txt")};
-}
+using clitest::CommandRun;
+using clitest::runRcvrchar;
 
 const char* kMillimetreWave =
     R"("idn": "Velquor Technologies,T3872B,MY00000001,A.13.55.06",
@@ -39,7 +24,7 @@ TEST(ExportCommand, FlashAnalyzerExportsEveryStoredCharacterizationWithoutAsking
     testsupport::writeFile(dir / "s.json", R"({"stored": [
         {"receiver": "B", "age_days": 30, "records": 3},
         {"receiver": "R1", "age_days": 1, "records": 2}]})");
-    CommandRun run = rcvrchar(dir, "export --analyzer sim:s.json --clock virtual");
+    CommandRun run = runRcvrchar(dir, "export --analyzer sim:s.json --clock virtual");
     ASSERT_EQ(run.status, 0) << run.err;
     EXPECT_EQ(run.out, "RcvrChar_R1_Exported.txt\nRcvrChar_B_Exported.txt\n");
     EXPECT_EQ(run.err, "");
@@ -55,7 +40,7 @@ TEST(ExportCommand, ShortImageEndsTheExportAndDecodeRoundTripsTheDataFile) {
         {"receiver": "R2", "age_days": 1, "records": 2},
         {"receiver": "C", "age_days": 1, "words": 30},
         {"receiver": "D", "age_days": 1, "records": 1}]})");
-    CommandRun run = rcvrchar(dir, "export --analyzer sim:m.json --clock virtual");
+    CommandRun run = runRcvrchar(dir, "export --analyzer sim:m.json --clock virtual");
     ASSERT_EQ(run.status, 0) << run.err;
     EXPECT_EQ(run.out, "RcvrChar_R2_Exported.txt\nRcvrChar_C_Exported.txt\n");
     EXPECT_EQ(run.err,
@@ -64,11 +49,11 @@ TEST(ExportCommand, ShortImageEndsTheExportAndDecodeRoundTripsTheDataFile) {
     EXPECT_EQ(testsupport::readFile(dir / "RcvrChar_C_Exported.txt"), "1\nC\n25\n-3\n30");
     EXPECT_FALSE(std::filesystem::exists(dir / "RcvrChar_D_Exported.txt"));
 
-    CommandRun decoded = rcvrchar(dir, "decode " + portFile(2, "RcvrCharRef.dat"));
+    CommandRun decoded = runRcvrchar(dir, "decode " + portFile(2, "RcvrCharRef.dat"));
     ASSERT_EQ(decoded.status, 0) << decoded.err;
     EXPECT_EQ(decoded.out, testsupport::readFile(dir / "RcvrChar_R2_Exported.txt"));
 
-    CommandRun shortFile = rcvrchar(dir, "decode " + portFile(3, "RcvrCharTest.dat"));
+    CommandRun shortFile = runRcvrchar(dir, "decode " + portFile(3, "RcvrCharTest.dat"));
     EXPECT_EQ(shortFile.status, 1);
     EXPECT_EQ(shortFile.out, "");
     EXPECT_NE(shortFile.err.find("RcvrCharTest.dat is not a characterization data file: the "
@@ -81,7 +66,7 @@ TEST(ExportCommand, ShortImageEndsTheExportAndDecodeRoundTripsTheDataFile) {
 TEST(ExportCommand, NothingStoredAndStateDirectoryOption) {
     testsupport::TempDir dir;
     std::filesystem::create_directory(dir / "work");
-    CommandRun run = rcvrchar(dir, "export --workdir work --sim-state state --clock virtual");
+    CommandRun run = runRcvrchar(dir, "export --workdir work --sim-state state --clock virtual");
     ASSERT_EQ(run.status, 0) << run.err;
     EXPECT_EQ(run.out, "");
     EXPECT_EQ(run.err, "The analyzer holds no characterization\n");
@@ -91,13 +76,13 @@ TEST(ExportCommand, NothingStoredAndStateDirectoryOption) {
 
 TEST(ExportCommand, UnusableOptionsAreNamed) {
     testsupport::TempDir dir;
-    CommandRun backEnd = rcvrchar(dir, "export --analyzer gpib:7");
+    CommandRun backEnd = runRcvrchar(dir, "export --analyzer gpib:7");
     EXPECT_EQ(backEnd.status, 1);
     EXPECT_EQ(backEnd.err, "--analyzer must be sim or sim:SCENARIO.json, not \"gpib:7\"\n");
-    CommandRun workdir = rcvrchar(dir, "export --workdir absent");
+    CommandRun workdir = runRcvrchar(dir, "export --workdir absent");
     EXPECT_EQ(workdir.status, 1);
     EXPECT_EQ(workdir.err, "--workdir absent is not a directory\n");
-    CommandRun clock = rcvrchar(dir, "export --clock fast");
+    CommandRun clock = runRcvrchar(dir, "export --clock fast");
     EXPECT_NE(clock.status, 0);
     EXPECT_NE(clock.err.find("--clock"), std::string::npos) << clock.err;
     EXPECT_FALSE(std::filesystem::exists(dir / "analyzer-sim"));
@@ -125,7 +110,7 @@ TEST(DecodeCommand, MalformedFilesGiveAClearErrorAndStatusOne) {
           Case{"levels.dat",
                "levels.dat is not a characterization data file: the header announces 9 "
                "compression levels, more than the 4 a record holds\n"}}) {
-        CommandRun run = rcvrchar(dir, std::string("decode ") + c.file);
+        CommandRun run = runRcvrchar(dir, std::string("decode ") + c.file);
         EXPECT_EQ(run.status, 1) << c.file;
         EXPECT_EQ(run.out, "") << c.file;
         EXPECT_EQ(run.err, c.error);
@@ -140,7 +125,7 @@ TEST(DecodeCommand, HeaderOnlyImagePrintsItsFiveLines) {
         "\x00\x00\xC8\x41\x00\x00\xC0\x3F\x00\x00\x20\x41",
         22);
     testsupport::writeFile(dir / "RcvrCharTest.dat", bytes);
-    CommandRun run = rcvrchar(dir, "decode RcvrCharTest.dat");
+    CommandRun run = runRcvrchar(dir, "decode RcvrCharTest.dat");
     ASSERT_EQ(run.status, 0) << run.err;
     EXPECT_EQ(run.out, "1\nA\n25\n1.5\n10");
 }

@@ -4,32 +4,21 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
-#include "TempDir.h"
+#include "RunRcvrchar.h"
 
 namespace {
 
-struct Result {
-    int status;
-    std::string err;
-};
+using clitest::CommandRun;
+using clitest::runRcvrchar;
 
-Result runRcvrchar(const testsupport::TempDir& dir, const std::string& arguments) {
-    const std::string command = "cd '" + dir.path().string() +
-                                "' && '" RCVRCHAR_BINARY_DIR "/bin/rcvrchar' " + arguments +
-                                " >out.txt 2>err.txt";
-    const int raw = std::system(command.c_str());
-    return {WIFEXITED(raw) ? WEXITSTATUS(raw) : -1, testsupport::readFile(dir / "err.txt")};
-}
-
-std::string sample() {
-    return "'" + testsupport::sampleConfiguration().string() + "'";
-}
+using clitest::quotedSample;
 
 // A raw CSV for test receiver A of the T3871B as a run would write it: the plan's frequencies
 // and ladder from the configuration, readings of a receiver compressing as Rapp's model with
 // the given saturation power (a huge one never compresses).
 std::string measuredCsv(const testsupport::TempDir& dir, double psat) {
-    EXPECT_EQ(runRcvrchar(dir, "config show --file " + sample() + " --model T3871B").status, 0);
+    EXPECT_EQ(runRcvrchar(dir, "config show --file " + quotedSample() + " --model T3871B").status,
+              0);
     const auto config = nlohmann::json::parse(testsupport::readFile(dir / "out.txt"));
     const auto& constants = config["constants"];
     const double start = constants["TESTSTARTPOWER"], stop = constants["TESTSTOPPOWER"],
@@ -78,7 +67,7 @@ const std::string kArguments =
 TEST(ReprocessCommand, HealthyDataWritesTheRawFileAndTheImage) {
     testsupport::TempDir dir;
     testsupport::writeFile(dir / "in.csv", measuredCsv(dir, -8));
-    const Result result = runRcvrchar(dir, kArguments + sample());
+    const CommandRun result = runRcvrchar(dir, kArguments + quotedSample());
     ASSERT_EQ(result.status, 0) << result.err;
     const std::string image = testsupport::readFile(dir / "RcvrChar_A.dat");
     ASSERT_GE(image.size(), 22u);
@@ -94,16 +83,16 @@ TEST(ReprocessCommand, BadDataFailsWithStatusTwoAndTheChosenImage) {
     testsupport::TempDir dir;
     // Compression far beyond every level at the lowest power: no growth between levels.
     testsupport::writeFile(dir / "in.csv", measuredCsv(dir, -80));
-    Result retest = runRcvrchar(dir, kArguments + sample());
+    CommandRun retest = runRcvrchar(dir, kArguments + quotedSample());
     EXPECT_EQ(retest.status, 2);
     EXPECT_EQ(retest.err, "The data of receiver A failed the bad-connection criteria\n");
     EXPECT_FALSE(std::filesystem::exists(dir / "RcvrChar_A.dat"));
 
-    Result quit = runRcvrchar(dir, kArguments + sample() + " --on-bad-data quit");
+    CommandRun quit = runRcvrchar(dir, kArguments + quotedSample() + " --on-bad-data quit");
     EXPECT_EQ(quit.status, 2);
     EXPECT_EQ(quit.err, "User aborted characterization due to bad data on receiver A\n");
 
-    Result defaulted = runRcvrchar(dir, kArguments + sample() + " --on-bad-data default");
+    CommandRun defaulted = runRcvrchar(dir, kArguments + quotedSample() + " --on-bad-data default");
     EXPECT_EQ(defaulted.status, 2);
     const std::string image = testsupport::readFile(dir / "RcvrChar_A.dat");
     ASSERT_GT(image.size(), 22u + 56u);
@@ -116,12 +105,12 @@ TEST(ReprocessCommand, BadDataFailsWithStatusTwoAndTheChosenImage) {
 TEST(ReprocessCommand, ErrorsGoToStderrWithStatusOne) {
     testsupport::TempDir dir;
     testsupport::writeFile(dir / "in.csv", "Freq,Rec Pow(-30),Mag(-30),Phase(-30)\n");
-    Result result = runRcvrchar(dir, kArguments + sample());
+    CommandRun result = runRcvrchar(dir, kArguments + quotedSample());
     EXPECT_EQ(result.status, 1);
     EXPECT_NE(result.err.find("in.csv line 1: the header does not name the"), std::string::npos)
         << result.err;
 
-    Result noFile = runRcvrchar(
+    CommandRun noFile = runRcvrchar(
         dir, "reprocess --csv in.csv --receiver A --model T3871B --out . --file missing.dat");
     EXPECT_EQ(noFile.status, 1);
     EXPECT_NE(noFile.err.find("missing.dat"), std::string::npos) << noFile.err;
