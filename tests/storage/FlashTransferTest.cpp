@@ -97,7 +97,6 @@ TEST(PortDataFile, NamesWithoutAPortAreRefused) {
 
 TEST(PushPortFile, WritesTheImageAndPushesItsPort) {
     SimBench bench(storagetest::kMillimetreWave);
-    ASSERT_TRUE(bench.analyzer->ismmwave());
     auto path = dataFile(2, "RcvrCharTest.dat");
     testsupport::writeFile(bench.local(path), std::string(9000, 'x'));  // replaced whole
     auto image = imageOf("B", 3);
@@ -105,9 +104,7 @@ TEST(PushPortFile, WritesTheImageAndPushesItsPort) {
 
     storage::pushPortFile(bench.context(), "B", image);
 
-    std::string bytes = testsupport::readFile(bench.local(path));
-    EXPECT_EQ(bytes.size(), 22u + 56u * 3u);
-    EXPECT_EQ(bytes, image.bytes());
+    EXPECT_EQ(testsupport::readFile(bench.local(path)), image.bytes());
     EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
     EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 2,0"});
     EXPECT_EQ(bench.logLines(),

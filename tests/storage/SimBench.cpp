@@ -28,15 +28,13 @@ std::vector<std::string> SimBench::commands() const {
 std::vector<std::string> SimBench::logLines() const {
     std::string text = testsupport::readFile(workDir() / "FlashCommands.txt");
     std::vector<std::string> lines;
-    std::size_t pos = 0;
-    while (pos < text.size()) {
-        std::size_t end = text.find("\r\n", pos);
+    for (std::size_t pos = 0, end; pos < text.size(); pos = end + 2) {
+        end = text.find("\r\n", pos);
         if (end == std::string::npos) {
             ADD_FAILURE() << "log line without CR LF: " << text.substr(pos);
             break;
         }
         lines.push_back(text.substr(pos, end - pos));
-        pos = end + 2;
     }
     return lines;
 }

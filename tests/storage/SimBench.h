@@ -49,15 +49,13 @@ class SimBench {
 
     storage::StorageContext context() { return {*analyzer, ui, clock, paths, log}; }
     std::filesystem::path workDir() const { return dir / "work"; }
-    std::filesystem::path drive() const { return simulator->driveRoot(); }
     // The local file of a Windows path on the analyzer's computer.
     std::filesystem::path local(const std::string& windowsPath) const {
         return paths.toLocal(windowsPath);
     }
 
-    // SCPI commands sent since the last clear, without the error-queue reads.
+    // SCPI commands sent since set-up, without the error-queue reads.
     std::vector<std::string> commands() const;
-    void clearTranscript() { simulator->clearTranscript(); }
     // The lines of FlashCommands.txt, which must all end in CR LF.
     std::vector<std::string> logLines() const;
 
