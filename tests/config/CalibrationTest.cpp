@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "ConfigTestFiles.h"
+#include "ErrorOf.h"
 #include "config/Calibration.h"
 
 namespace {
@@ -45,7 +45,7 @@ TEST(CalibrationSubSteps, SameNameReplacesOtherNameConflicts) {
     calibration.AddSub(again);
     ASSERT_EQ(calibration.SubCount(), 1);
     EXPECT_EQ(calibration.GetSubs()[0].GetIFBW(), 300);
-    EXPECT_EQ(configtest::errorText([&] { calibration.AddSub(sub("other", 5)); }),
+    EXPECT_EQ(testsupport::errorOf([&] { calibration.AddSub(sub("other", 5)); }),
               "CCalibration::AddSub Unable to add sub other position all ready Exists");
     EXPECT_EQ(calibration.SubCount(), 1);
 }

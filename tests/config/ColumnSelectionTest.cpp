@@ -2,12 +2,14 @@
 
 #include <sstream>
 
-#include "ConfigTestFiles.h"
+#include "ErrorOf.h"
 #include "config/CSVExtra.h"
 #include "config/OptionReply.h"
 #include "config/Split.h"
 
 namespace {
+
+using testsupport::errorOf;
 
 TEST(OptionRules, ChooseLastQualifyingHeading) {
     using Texts = std::vector<std::string>;
@@ -77,42 +79,37 @@ TEST_F(Selection, SelectColumnGivesIndexInBlock) {
 }
 
 TEST_F(Selection, RowsAndColumnsWithoutCandidatesNameThePartials) {
-    using configtest::errorText;
     m_csv.SetSelection({"010"}, "T3872A");
-    EXPECT_EQ(errorText([&] { m_csv.SelectColumn("Preset Powers", {"T3999"}); }),
+    EXPECT_EQ(errorOf([&] { m_csv.SelectColumn("Preset Powers", {"T3999"}); }),
               "Column was not found, Partials searched forT3999 and that's it!");
     // An option column whose options are not installed is no candidate.
-    EXPECT_EQ(errorText([&] {
+    EXPECT_EQ(errorOf([&] {
                   m_csv.FindSelection(*m_block, {"T3872", "AOPT"}, true, true);
               }),
               "Column was not found, Partials searched forT3872 andAOPT and that's it!");
     EXPECT_EQ(m_csv.FindSelection(*m_block, {"T3999"}, false, false), "");
     m_block->SetHeaderFlag(false);
     EXPECT_EQ(m_csv.FindSelection(*m_block, {"preset"}, false, true), "Preset Powers");
-    EXPECT_EQ(errorText([&] { m_csv.FindSelection(*m_block, {"Nothing"}, false, true); }),
+    EXPECT_EQ(errorOf([&] { m_csv.FindSelection(*m_block, {"Nothing"}, false, true); }),
               "Row was not found, Partials searched forNothing and that's it!");
 }
 
-TEST(SplitText, DelimiterRunsCountAsOne) {
-    std::vector<std::string> tokens{"stale"};
-    EXPECT_EQ(Split("R1,,A", tokens, ",", '&'), 2);
-    EXPECT_EQ(tokens, (std::vector<std::string>{"R1", "A"}));
-    EXPECT_EQ(Split(",,", tokens, ",", '&'), 0);
-    EXPECT_TRUE(tokens.empty());
-    EXPECT_EQ(Split("", tokens, ",", '&'), 0);
-    EXPECT_EQ(Split(" -30, 0", tokens, ",", '&'), 2);
-    EXPECT_EQ(tokens, (std::vector<std::string>{" -30", " 0"}));
-}
-
-TEST(SplitText, GroupsKeepDelimiters) {
-    std::vector<std::string> tokens;
-    EXPECT_EQ(Split("R1,&R1 LOW, HIGH&,B", tokens, ",", '&'), 3);
-    EXPECT_EQ(tokens, (std::vector<std::string>{"R1", "R1 LOW, HIGH", "B"}));
-    // An unclosed group is dropped and scanning resumes after its opening character.
-    EXPECT_EQ(Split("&open,b", tokens, ",", '&'), 2);
-    EXPECT_EQ(tokens, (std::vector<std::string>{"open", "b"}));
-    EXPECT_EQ(Split("a,&&,b", tokens, ",", '&'), 2);
-    EXPECT_EQ(tokens, (std::vector<std::string>{"a", "b"}));
+TEST(SplitText, DelimiterRunsCountAsOneAndGroupsKeepDelimiters) {
+    const std::pair<std::string, std::vector<std::string>> cases[] = {
+        {"R1,,A", {"R1", "A"}},
+        {",,", {}},
+        {"", {}},
+        {" -30, 0", {" -30", " 0"}},
+        {"R1,&R1 LOW, HIGH&,B", {"R1", "R1 LOW, HIGH", "B"}},
+        // An unclosed group is dropped and scanning resumes after its opening character.
+        {"&open,b", {"open", "b"}},
+        {"a,&&,b", {"a", "b"}},
+    };
+    for (const auto& [text, expected] : cases) {
+        std::vector<std::string> tokens{"stale"};
+        EXPECT_EQ(Split(text, tokens, ",", '&'), static_cast<int>(expected.size())) << text;
+        EXPECT_EQ(tokens, expected) << text;
+    }
 }
 
 TEST(SplitText, WordsSplitAtBlanksAndTabsWithQuotes) {

@@ -54,15 +54,4 @@ inline std::string replaced(std::string text, const std::string& what, const std
     return text.replace(at, what.size(), with);
 }
 
-// The text of the std::string a call throws; any other exception escapes to fail the test.
-template <typename Call>
-std::string errorText(Call call) {
-    try {
-        call();
-    } catch (const std::string& text) {
-        return text;
-    }
-    return "no error";
-}
-
 }  // namespace configtest

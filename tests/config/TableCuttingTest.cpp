@@ -2,12 +2,12 @@
 
 #include <sstream>
 
-#include "ConfigTestFiles.h"
+#include "ErrorOf.h"
 #include "config/CSVContainer.h"
 
 namespace {
 
-using configtest::errorText;
+using testsupport::errorOf;
 
 // A container read from text with the header flag off, as the configuration readers use it.
 class TableCutting : public ::testing::Test {
@@ -39,19 +39,6 @@ const char* const kTwoModels =
     "T3877A,Value,c2,c3\n"
     "maxband,5\n";
 
-TEST_F(TableCutting, ModelTableRunsToFirstEmptyRow) {
-    load(kTwoModels);
-    CCSVTable* table = m_csv.CreateTable("t3872a", true);
-    ASSERT_NE(table, nullptr);
-    EXPECT_EQ(table->GetName(), "T3872A");
-    EXPECT_EQ(table->GetFirstRow(), 2);
-    EXPECT_EQ(table->GetColumnEnd(), 4);
-    EXPECT_EQ(table->GetRowEnd(), 9);
-    EXPECT_EQ(table->RowCount(), 6U);  // header row excluded
-    EXPECT_EQ(table->GetCell(0, 0), "minband");
-    EXPECT_EQ(column(*table, "t3872a").back(), "");
-}
-
 TEST_F(TableCutting, TableShapes) {
     struct Case {
         const char* text;
@@ -63,6 +50,8 @@ TEST_F(TableCutting, TableShapes) {
         const char* cell;
     };
     const Case cases[] = {
+        // A model's table runs to its first empty row; the heading row is no data row.
+        {kTwoModels, "t3872a", true, 2, 0, 4, 6, 0, "minband"},
         // Ends at the first row empty within its columns, whatever lies beyond.
         {"x,y\nTab,H1\n1,2\n,,beyond\n3,4\n", "Tab", false, -1, -1, -1, 1, 1, "2"},
         // Cells beyond the column end are cut.
@@ -99,20 +88,16 @@ TEST_F(TableCutting, TableShapes) {
     EXPECT_EQ(m_csv.CreateTable("grid", false)->GetHeader().GetText(1), "H");
 }
 
-TEST_F(TableCutting, MissingTableIsNoError) {
+TEST_F(TableCutting, MissingTableIsNoErrorDuplicateAndMissingParentAre) {
     load(kTwoModels);
     EXPECT_EQ(m_csv.CreateTable("T3999A", true), nullptr);
     EXPECT_EQ(m_csv.TableCount(), 0U);
-}
-
-TEST_F(TableCutting, DuplicateAndMissingParentAreErrors) {
-    load(kTwoModels);
     ASSERT_NE(m_csv.CreateTable("T3872A", true), nullptr);
-    EXPECT_EQ(errorText([&] { m_csv.CreateTable("T3872", true); }), "Table already exists!: T3872");
+    EXPECT_EQ(errorOf([&] { m_csv.CreateTable("T3872", true); }), "Table already exists!: T3872");
     ASSERT_NE(m_csv.CreateSubTable("T3872A", "Banded"), nullptr);
-    EXPECT_EQ(errorText([&] { m_csv.CreateSubTable("T3872A", "banded"); }),
+    EXPECT_EQ(errorOf([&] { m_csv.CreateSubTable("T3872A", "banded"); }),
               "Table already exists!: banded");
-    EXPECT_EQ(errorText([&] { m_csv.CreateSubTable("T3999A", "Preset Powers"); }),
+    EXPECT_EQ(errorOf([&] { m_csv.CreateSubTable("T3999A", "Preset Powers"); }),
               "Table not found: T3999Ain CSV.");
 }
 
@@ -200,7 +185,7 @@ TEST_F(TableCutting, FindRowModes) {
     found.clear();
     m_csv.findRow({"cherry", "green"}, found, "any");
     EXPECT_EQ(found, (std::vector<std::string>{"Red Cherry", "Green Apple"}));
-    EXPECT_EQ(errorText([&] { m_csv.findRow({}, found, "ALL"); }),
+    EXPECT_EQ(errorOf([&] { m_csv.findRow({}, found, "ALL"); }),
               "Partial string vector empty! (CContainer::findRow)");
 }
 
