@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <sstream>
 
 #include "TempDir.h"
 #include "config/T3872Acomcal.h"
@@ -37,18 +38,12 @@ class SampleConfiguration : public ::testing::TestWithParam<SampleModel> {};
 
 TEST_P(SampleConfiguration, HoldsEverythingARunReads) {
     auto config = readSample(GetParam().model, GetParam().options);
-    for (const char* name : {"minband",           "maxband",
-                             "pntsperband",       "teststartpower",
-                             "teststoppower",     "testpowerstep",
-                             "RChannel_minband",  "RChannelPwr_TstMin",
-                             "RChannelPwr_TstMx", "RChannelPwr_TstStep",
-                             "RChannelRef",       "refpower",
-                             "SPAMClipPower",     "CalPowDelta",
-                             "minCompStepRatio",  "MaxMeasuredFrequency",
-                             "testifbw",          "refaverages",
-                             "IFBWOnOff",         "testAtten",
-                             "RChannelAtten",     "ExternalR1",
-                             "testaverages"}) {
+    std::istringstream runConstants(
+        "minband maxband pntsperband teststartpower teststoppower testpowerstep RChannel_minband "
+        "RChannelPwr_TstMin RChannelPwr_TstMx RChannelPwr_TstStep RChannelRef refpower "
+        "SPAMClipPower CalPowDelta minCompStepRatio MaxMeasuredFrequency testifbw refaverages "
+        "IFBWOnOff testAtten RChannelAtten ExternalR1 testaverages");
+    for (std::string name; runConstants >> name;) {
         EXPECT_TRUE(config->HasConstant(name)) << name;
     }
     EXPECT_GE(
