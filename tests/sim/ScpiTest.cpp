@@ -43,38 +43,16 @@ TEST(ScpiSyntax, ReadsParametersInEverySciForm) {
         }
         return 0;
     };
-    EXPECT_EQ(-104, code("abc", [](auto& r) { r.number(); }));
     EXPECT_EQ(-104, code("12", [](auto& r) { r.string(); }));
     EXPECT_EQ(-151, code("\"open", [](auto& r) { r.string(); }));
     EXPECT_EQ(-109, code("", [](auto& r) { r.number(); }));
     EXPECT_EQ(-109, code("1,", [](auto& r) { r.number(), r.number(); }));
     EXPECT_EQ(-131, code("5 furlongs", [](auto& r) { r.number(); }));
     EXPECT_EQ(-224, code("maybe", [](auto& r) { r.boolean(); }));
-    EXPECT_EQ(-108, code("1,2", [](auto& r) { r.number(), r.finish(); }));
 }
 
-TEST(ScpiSyntax, FlashWordsAreSixteenBitUnsigned) {
-    sim::ParameterReader r(" 1, 65535,0");
-    std::uint16_t w = 0;
-    std::vector<std::uint16_t> words;
-    while (r.nextWord(w)) {
-        words.push_back(w);
-    }
-    EXPECT_EQ((std::vector<std::uint16_t>{1, 65535, 0}), words);
-    sim::ParameterReader big("65536");
-    EXPECT_THROW(big.nextWord(w), sim::ScpiError);
-    sim::ParameterReader negative("-1");
-    EXPECT_THROW(negative.nextWord(w), sim::ScpiError);
-}
-
-TEST(ErrorQueue, IsFirstInFirstOutAndReportsOverflow) {
+TEST(ErrorQueue, ReportsOverflowInTheLastPlace) {
     sim::ErrorQueue q;
-    EXPECT_EQ("0,\"No error\"", q.pop());
-    q.push(-113, "Undefined header");
-    q.pushText("-200,\"Execution error\"");
-    EXPECT_EQ("-113,\"Undefined header\"", q.pop());
-    EXPECT_EQ("-200,\"Execution error\"", q.pop());
-    EXPECT_EQ("0,\"No error\"", q.pop());
     for (int i = 0; i < 150; ++i) {
         q.push(-100, "Command error");
     }
@@ -90,12 +68,10 @@ class Scpi : public SimFixture {
     void SetUp() override { start(R"({"options": "010,080"})"); }
 };
 
-TEST_F(Scpi, IdentityAndStartUpQueries) {
-    EXPECT_EQ("Velquor Technologies,T3872A,MY00000001,A.13.55.06", scpi("*IDN?"));
-    EXPECT_EQ("\"010,080\"", scpi("*opt?"));
+TEST_F(Scpi, StartUpQueriesAlsoAsOneCompoundMessage) {
+    EXPECT_EQ("4;\"010,080\"", scpi("diag:portcount?;*OPT?"));
     EXPECT_EQ("\"C:\\Program Files (x86)\\Velquor\\Network Analyzer\"",
               scpi("SYST:CONF:DIRectory? APPLICATION"));
-    EXPECT_EQ("4", scpi("diag:portcount?"));
     EXPECT_EQ("\"Default\"", scpi("SYST:CONF:MWAV:CONF:CAT?"));
     EXPECT_EQ("0,\"No error\"", nextError());
 }
@@ -134,13 +110,7 @@ TEST_F(Scpi, KeywordsMatchInShortAndLongFormAnyCase) {
     EXPECT_EQ("0,\"No error\"", nextError());
 }
 
-TEST_F(Scpi, CompoundMessagesRunEachUnitAndJoinReplies) {
-    EXPECT_EQ("4;\"010,080\"", scpi("diag:portcount?;*OPT?"));
-}
-
-TEST_F(Scpi, NarrowbandAttenuatorAndPathElements) {
-    EXPECT_EQ("\"30\"", scpi("SENS:PATH:CONF:ELEM? \"NBFATNR1\""));
-    EXPECT_EQ("\"30\"", scpi("SENS:PATH:CONF:ELEM? \"NBFATNC\""));
+TEST_F(Scpi, IfPathAndMissingPathElements) {
     EXPECT_EQ("\"WBF\"", scpi("SENS:PATH:CONF:ELEM? \"IFSIGPATHALL\""));
     scpi("SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"NBF\"");
     EXPECT_EQ("\"NBF\"", scpi("SENS:PATH:CONF:ELEM? \"IFSIGPATHALL\""));
@@ -150,22 +120,19 @@ TEST_F(Scpi, NarrowbandAttenuatorAndPathElements) {
     EXPECT_EQ("-224,\"Illegal parameter value; no path element \"NBFATNE\"\"", nextError());
 }
 
+// Engine commands that no other test here sends and checks.
 TEST_F(Scpi, EngineSetUpCommandsAreAccepted) {
     for (const char* command : {"DIAG:RXCAL:STATE OFF",
-                                "CALC:PAR:DEL:ALL",
                                 "CALC:PAR:DEF:EXT \"measmag\",\"R1,1\"",
                                 "DISP:WIND:TRACE1:FEED \"measmag\"",
                                 "SENS:SWE:LFEX:STAT ON",
-                                "SENS:PATH:CONF:ELEM \"IFSIGPATHALL\",\"WBF\"",
                                 "DIAG:RXCAL:STATE ON",
                                 "DIAG:CMPCAL:STATE ON",
                                 "DIAG:MXCAL:STATE OFF",
                                 "DIAG:SWEEP_PARM \"SweepParm\",\"TRUE\"",
                                 "CALC:PAR:DEF:EXT \"measratio\",\"A/R1,1\"",
                                 "DISP:WIND:TRACE2:FEED \"measratio\"",
-                                "SENS:AVER:STAT ON",
                                 "SENS:AVER:CLE",
-                                "SENS:AVER:COUN 5",
                                 "CALC:PAR:SEL \"measmag\"",
                                 "CALC:FUNCTION:STAT ON",
                                 "DISP:WIND:TRACE1:SEL",
@@ -174,14 +141,7 @@ TEST_F(Scpi, EngineSetUpCommandsAreAccepted) {
                                 "display:window:trace2:y:pdivision 0.1",
                                 "format:data ASC",
                                 "calculate:function:type MEAN",
-                                "DIAG:POKE 9,4",
-                                "DIAG:POKE 9,3",
-                                "DIAG:EEUPDATEHW",
-                                "diag:poke:long 9,3",
-                                "diag:eeupdatehw",
-                                "diag:fcal:load",
-                                "diag:mm:data:push 1,0",
-                                "SENSe:PATH:CONF:ELEMent:STATe \"Port1RefMxr\",\"External\""}) {
+                                "diag:mm:data:push 1,0"}) {
         SCOPED_TRACE(command);
         EXPECT_EQ("", scpi(command));
         EXPECT_EQ("0,\"No error\"", nextError());
@@ -230,14 +190,11 @@ TEST_F(Scpi, TranscriptRecordsCommandsRepliesErrorsAndCalls) {
     scpi("*IDN?");
     scpi("NOPE");
     channel()->setSweepType(3);
-    auto lines = m_analyzer->transcript();
-    ASSERT_EQ(6u, lines.size());
-    EXPECT_EQ("> *IDN?", lines[0]);
-    EXPECT_EQ("< Velquor Technologies,T3872A,MY00000001,A.13.55.06", lines[1]);
-    EXPECT_EQ("> NOPE", lines[2]);
-    EXPECT_EQ("! -113,\"Undefined header\"", lines[3]);
-    EXPECT_EQ("@ Application.activeChannel()", lines[4]);
-    EXPECT_EQ("@ Channel.setSweepType(3)", lines[5]);
+    EXPECT_EQ(
+        (std::vector<std::string>{"> *IDN?", "< Velquor Technologies,T3872A,MY00000001,A.13.55.06",
+                                  "> NOPE", "! -113,\"Undefined header\"",
+                                  "@ Application.activeChannel()", "@ Channel.setSweepType(3)"}),
+        m_analyzer->transcript());
 }
 
 TEST_F(Scpi, TraceFileReceivesTheTranscript) {
