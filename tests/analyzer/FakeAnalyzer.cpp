@@ -14,11 +14,9 @@ std::string CallLog::number(double value) {
 }
 
 std::vector<std::string> CallLog::scpi() const {
-    std::vector<std::string> result;
-    for (const auto& call : calls) {
-        if (call.starts_with("scpi ")) {
-            result.push_back(call.substr(5));
-        }
+    auto result = matching("scpi ");
+    for (auto& command : result) {
+        command.erase(0, 5);
     }
     return result;
 }
@@ -66,13 +64,6 @@ long FakeMeasurement::readData(int location, int formatCode, long& points,
         destination[static_cast<std::size_t>(i)] = static_cast<float>(formatCode * 1000 + i);
     }
     return 0;
-}
-
-std::shared_ptr<automation::Object> FakeCollection::item(int index) {
-    if (index < 1 || index > count()) {
-        return nullptr;
-    }
-    return items[static_cast<std::size_t>(index - 1)];
 }
 
 FakeAnalyzer::FakeAnalyzer()

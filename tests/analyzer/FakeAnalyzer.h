@@ -28,6 +28,12 @@ struct CallLog {
         ((text += (text.empty() ? "" : ",") + argument(args)), ...);
         calls.push_back(what + "(" + text + ")");
     }
+    // Records a getter's call and hands its value back.
+    template <typename T>
+    T logged(const std::string& call, T value) {
+        add(call);
+        return value;
+    }
 
   private:
     static std::string number(double value);
@@ -83,7 +89,9 @@ class FakeCollection : public automation::MeasurementCollection {
   public:
     std::vector<std::shared_ptr<automation::Object>> items;
     int count() override { return static_cast<int>(items.size()); }
-    std::shared_ptr<automation::Object> item(int index) override;
+    std::shared_ptr<automation::Object> item(int index) override {
+        return items.at(static_cast<std::size_t>(index - 1));
+    }
 };
 
 class FakeSegmentTable : public automation::SegmentTable {
@@ -109,14 +117,14 @@ class FakeChannel : public automation::Channel {
     FakeChannel(std::shared_ptr<CallLog> log, std::shared_ptr<automation::Object> segmentTable)
         : m_log(std::move(log)), m_segmentTable(std::move(segmentTable)) {}
     void setSweepType(int code) override { m_log->add("channel.setSweepType", code); }
-    double startFrequency() override { return logged("channel.startFrequency", start); }
-    double stopFrequency() override { return logged("channel.stopFrequency", stop); }
+    double startFrequency() override { return m_log->logged("channel.startFrequency", start); }
+    double stopFrequency() override { return m_log->logged("channel.stopFrequency", stop); }
     void setCwFrequency(double hz) override {
         m_log->add("channel.setCwFrequency", hz);
         start = stop = hz;
     }
-    double startPower() override { return logged("channel.startPower", powerStart); }
-    double stopPower() override { return logged("channel.stopPower", powerStop); }
+    double startPower() override { return m_log->logged("channel.startPower", powerStart); }
+    double stopPower() override { return m_log->logged("channel.stopPower", powerStop); }
     void setStartPower(double dbm) override {
         m_log->add("channel.setStartPower", dbm);
         powerStart = dbm;
@@ -126,7 +134,7 @@ class FakeChannel : public automation::Channel {
         powerStop = dbm;
     }
     void setIfBandwidth(double hz) override { m_log->add("channel.setIfBandwidth", hz); }
-    long numberOfPoints() override { return logged("channel.numberOfPoints", points); }
+    long numberOfPoints() override { return m_log->logged("channel.numberOfPoints", points); }
     void setNumberOfPoints(long value) override {
         m_log->add("channel.setNumberOfPoints", value);
         points = value;
@@ -139,7 +147,7 @@ class FakeChannel : public automation::Channel {
     void setContinuousSweep(bool on) override { m_log->add("channel.setContinuousSweep", on); }
     void setIfBandwidthSwitch(bool on) override { m_log->add("channel.setIfBandwidthSwitch", on); }
     std::shared_ptr<automation::Object> segmentTable() override {
-        return logged("channel.segmentTable", m_segmentTable);
+        return m_log->logged("channel.segmentTable", m_segmentTable);
     }
 
     double start = 10e6;
@@ -149,11 +157,6 @@ class FakeChannel : public automation::Channel {
     long points = 201;
 
   private:
-    template <typename T>
-    T logged(const std::string& call, T value) {
-        m_log->add(call);
-        return value;
-    }
     std::shared_ptr<CallLog> m_log;
     std::shared_ptr<automation::Object> m_segmentTable;
 };
@@ -162,18 +165,18 @@ class FakeApplication : public automation::Application {
   public:
     explicit FakeApplication(std::shared_ptr<CallLog> log) : m_log(std::move(log)) {}
     std::shared_ptr<automation::Object> scpiParser() override {
-        return logged("app.scpiParser", parser);
+        return m_log->logged("app.scpiParser", parser);
     }
     void reset() override { m_log->add("app.reset"); }
     void preset(int value) override { m_log->add("app.preset", value); }
     std::shared_ptr<automation::Object> activeChannel() override {
-        return logged("app.activeChannel", channel);
+        return m_log->logged("app.activeChannel", channel);
     }
     std::shared_ptr<automation::Object> currentMeasurement() override {
-        return logged("app.currentMeasurement", current);
+        return m_log->logged("app.currentMeasurement", current);
     }
     std::shared_ptr<automation::Object> measurements() override {
-        return logged("app.measurements", collection);
+        return m_log->logged("app.measurements", collection);
     }
     void setTriggerSetting(int value) override { m_log->add("app.setTriggerSetting", value); }
     void wait(int value, int timeLimitMs) override { m_log->add("app.wait", value, timeLimitMs); }
@@ -184,11 +187,6 @@ class FakeApplication : public automation::Application {
     std::shared_ptr<automation::Object> collection;
 
   private:
-    template <typename T>
-    T logged(const std::string& call, T value) {
-        m_log->add(call);
-        return value;
-    }
     std::shared_ptr<CallLog> m_log;
 };
 
