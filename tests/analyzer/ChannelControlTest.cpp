@@ -90,7 +90,7 @@ TEST_F(ProxyTest, PathElementsAreSentAllButTheLast) {
     EXPECT_EQ(proxy->pathdescription(), "Port 2 ");
     EXPECT_EQ(fake.log->scpi().size(), 2u);
 
-    EXPECT_EQ(RAISED_TEXT(proxy->setpathelement("A,1/Bogus/Config")),
+    EXPECT_EQ(errorOf([&] { proxy->setpathelement("A,1/Bogus/Config"); }),
               "CNetworkAnalyzer::setpathelement: the item \"Bogus\" of \"A,1/Bogus/Config\" is "
               "not an element name, a comma and a value");
 }
@@ -124,11 +124,12 @@ TEST_F(ProxyTest, SegmentTableSwitchesBandwidthAndPower) {
                             "segments.enablePerSegmentPower()", "segments.writeTable(2)"));
     EXPECT_EQ(proxy->readnumberofpoints(false), 11 + 21);
 
-    EXPECT_EQ(
-        RAISED_TEXT(proxy->setsegments(starts, stops, {1, 2}, sameBandwidth, samePower, 1, 3)),
-        "CNetworkAnalyzer::setsegments: segments 1 to 3 do not fit the segment lists "
-        "(shortest list has 2 entries)");
-    EXPECT_EQ(RAISED_TEXT(proxy->setsegments({}, {}, {}, {}, {}, 0, 0)),
+    EXPECT_EQ(errorOf([&] {
+                  proxy->setsegments(starts, stops, {1, 2}, sameBandwidth, samePower, 1, 3);
+              }),
+              "CNetworkAnalyzer::setsegments: segments 1 to 3 do not fit the segment lists "
+              "(shortest list has 2 entries)");
+    EXPECT_EQ(errorOf([&] { proxy->setsegments({}, {}, {}, {}, {}, 0, 0); }),
               "CNetworkAnalyzer::setsegments: segments 0 to -1 do not fit the segment lists "
               "(shortest list has 0 entries)");
 }

@@ -13,7 +13,7 @@ TEST_F(ProxyTest, EveryCommandWaitsAndReturnsTheWholeReply) {
 
     // A failing parser is not mistaken for an empty reply; the pause is kept all the same.
     fake.parser->failingCommand = "*IDN?";
-    EXPECT_EQ(RAISED_TEXT(proxy->readmodel(true)), "link to the analyzer lost");
+    EXPECT_EQ(errorOf([&] { proxy->readmodel(true); }), "link to the analyzer lost");
     EXPECT_EQ(clock.totalWaited().count(), 150);
 }
 
@@ -41,13 +41,13 @@ TEST_F(ProxyTest, BrokenErrorQueueRaisesInsteadOfLooping) {
     auto proxy = connect();
     std::string errors;
     fake.parser->reply("SYST:ERR?", {"No error"});
-    EXPECT_EQ(RAISED_TEXT(proxy->checkerrors(errors)),
+    EXPECT_EQ(errorOf([&] { proxy->checkerrors(errors); }),
               "CNetworkAnalyzer::checkerrors cannot read the SYST:ERR? reply \"No error\" (code, "
               "comma, message expected)");
 
     fake.log->clear();
     fake.parser->reply("SYST:ERR?", {"-350,\"Queue overflow\""});
-    const std::string text = RAISED_TEXT(proxy->checkerrors(errors));
+    const std::string text = errorOf([&] { proxy->checkerrors(errors); });
     EXPECT_THAT(text, HasSubstr("gave up after 1000 entries"));
     EXPECT_THAT(text, HasSubstr(",\"Queue overflow\""));
     EXPECT_EQ(fake.log->scpi().size(), 1000u);

@@ -6,7 +6,7 @@ using ::testing::IsEmpty;
 
 TEST_F(ProxyTest, ConstructionFailurePaths) {
     // No back end answers the host name.
-    EXPECT_EQ(RAISED_TEXT(CNetworkAnalyzer("nowhere", ui, clock)),
+    EXPECT_EQ(errorOf([&] { CNetworkAnalyzer("nowhere", ui, clock); }),
               "The software driver\r\nassociated with that com object was not found or could "
               "not be properly loaded.");
 
@@ -18,8 +18,8 @@ TEST_F(ProxyTest, ConstructionFailurePaths) {
     ASSERT_EQ(ui.boxes().size(), 1u);
     EXPECT_EQ(ui.boxes()[0].box.text, "Unable to create COM object for TVA Application plain");
     EXPECT_EQ(ui.boxes()[0].box.caption, "Critical Error");
-    EXPECT_EQ(RAISED_TEXT(orphan.preparecal()), "m_pTVAap != NULL");
-    EXPECT_EQ(RAISED_TEXT(orphan.readportcount(true)), "m_pTVAap != NULL");
+    EXPECT_EQ(errorOf([&] { orphan.preparecal(); }), "m_pTVAap != NULL");
+    EXPECT_EQ(errorOf([&] { orphan.readportcount(true); }), "m_pTVAap != NULL");
 
     // An application without a parser: usable object, but no command can be sent.
     fake.application->parser = nullptr;
@@ -28,7 +28,7 @@ TEST_F(ProxyTest, ConstructionFailurePaths) {
     ASSERT_EQ(ui.boxes().size(), 2u);
     EXPECT_EQ(ui.boxes()[1].box.text, "could not create TVA SCPI Parser");
     EXPECT_EQ(ui.boxes()[1].box.caption, "");
-    EXPECT_EQ(RAISED_TEXT(mute->readmodel(true)),
+    EXPECT_EQ(errorOf([&] { mute->readmodel(true); }),
               "could not create TVA SCPI Parser: the analyzer cannot be sent \"*IDN?\"");
     EXPECT_EQ(clock.totalWaited().count(), 0);
 }
@@ -44,7 +44,7 @@ TEST_F(ProxyTest, HealthyConstructionAsksOnlyForTheParser) {
     EXPECT_THAT(proxy->readoptions(false), IsEmpty());
     EXPECT_THAT(fake.log->scpi(), IsEmpty());
     // Channel operations need preparecal.
-    EXPECT_EQ(RAISED_TEXT(proxy->setcwfrequency(1e9)), "m_pActiveChannel != NULL");
+    EXPECT_EQ(errorOf([&] { proxy->setcwfrequency(1e9); }), "m_pActiveChannel != NULL");
 }
 
 TEST_F(ProxyTest, ModelWithMillimetreWaveSubstitution) {
@@ -90,11 +90,11 @@ TEST_F(ProxyTest, ModelWithMillimetreWaveSubstitution) {
 TEST_F(ProxyTest, MalformedIdentificationIsReportedWithTheReply) {
     auto proxy = connect();
     fake.parser->reply("*IDN?", {"Maker T3872A"});
-    EXPECT_EQ(RAISED_TEXT(proxy->readmodel(true)),
+    EXPECT_EQ(errorOf([&] { proxy->readmodel(true); }),
               "CNetworkAnalyzer::readmodel cannot find the model field in the *IDN? reply "
               "\"Maker T3872A\" (maker, model, serial, firmware expected)");
     fake.parser->reply("*IDN?", {"Maker,T3872A"});
-    EXPECT_THAT(RAISED_TEXT(proxy->readmodel(true)), HasSubstr("\"Maker,T3872A\""));
+    EXPECT_THAT(errorOf([&] { proxy->readmodel(true); }), HasSubstr("\"Maker,T3872A\""));
 }
 
 TEST_F(ProxyTest, OptionsSplitAndBaseModelCodes) {
@@ -126,7 +126,7 @@ TEST_F(ProxyTest, OptionsSplitAndBaseModelCodes) {
 
     fake.parser->reply("*IDN?", {"Maker,T3112B,1,2"});
     proxy->readmodel(true);
-    EXPECT_EQ(RAISED_TEXT(proxy->readoptions(true)),
+    EXPECT_EQ(errorOf([&] { proxy->readoptions(true); }),
               "CNetworkAnalyzer::readoptions T3112Bis not a recognized base TVA model for T3951A");
 }
 
@@ -134,7 +134,7 @@ TEST_F(ProxyTest, MalformedOptionReplyIsReportedWithTheReply) {
     auto proxy = connect();
     for (const char* reply : {"010,080", "\"010,080"}) {
         fake.parser->reply("*opt?", {reply});
-        EXPECT_EQ(RAISED_TEXT(proxy->readoptions(true)),
+        EXPECT_EQ(errorOf([&] { proxy->readoptions(true); }),
                   std::string("CNetworkAnalyzer::readoptions cannot find the quoted option list "
                               "in the *opt? reply \"") +
                       reply + "\"");

@@ -6,22 +6,13 @@
 #include <memory>
 #include <string>
 
+#include "ErrorOf.h"
 #include "FakeAnalyzer.h"
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "platform/Clock.h"
-#include "platform/ErrorText.h"
 #include "platform/ScriptedOperatorUi.h"
 
-// Runs statement and returns the text of what it raised ("" when it raised nothing).
-#define RAISED_TEXT(statement)                   \
-    [&]() -> std::string {                       \
-        try {                                    \
-            statement;                           \
-        } catch (...) {                          \
-            return platform::currentErrorText(); \
-        }                                        \
-        return std::string();                    \
-    }()
+using testsupport::errorOf;
 
 class ProxyTest : public ::testing::Test {
   protected:

@@ -36,19 +36,19 @@ TEST_F(TraceTest, FormatsMapToTheirCodes) {
 
 TEST_F(TraceTest, FailedReadsNameMeasurementAndFormat) {
     std::vector<float> trace(21);
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("measmag", "dB", trace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("measmag", "dB", trace); }),
               "CNetworkAnalyzer::readdata DBIs not a recognized format");
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("unknown", "polar", trace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("unknown", "polar", trace); }),
               "CNetworkAnalyzer::readdata POLARIs not a recognized format");
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("measMag", "LOGMAG", trace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("measMag", "LOGMAG", trace); }),
               "CNetworkAnalyzer::readdata LOGMAG of measurement \"measMag\": no such measurement "
               "among the 2 last listed by the analyzer");
     measratio->status = -2147467259;
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("measratio", "phase", trace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("measratio", "phase", trace); }),
               "CNetworkAnalyzer::readdata PHASE of measurement \"measratio\" failed with status "
               "-2147467259");
     std::vector<float> shortTrace(20);
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("measmag", "LOGMAG", shortTrace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("measmag", "LOGMAG", shortTrace); }),
               "CNetworkAnalyzer::readdata LOGMAG of measurement \"measmag\": the buffer holds 20 "
               "values, the channel has 21 points");
     // Only the status read reached the analyzer.
@@ -56,7 +56,7 @@ TEST_F(TraceTest, FailedReadsNameMeasurementAndFormat) {
 
     // The analyzer reports more points than the buffer took.
     measmag->deliveredPoints = 30;
-    EXPECT_EQ(RAISED_TEXT(proxy->readdata("measmag", "LOGMAG", trace)),
+    EXPECT_EQ(errorOf([&] { proxy->readdata("measmag", "LOGMAG", trace); }),
               "CNetworkAnalyzer::readdata LOGMAG of measurement \"measmag\": the analyzer "
               "delivered 30 points, the buffer holds 21");
 }
@@ -78,17 +78,17 @@ TEST_F(TraceTest, TablesAreRebuiltAndEmptied) {
     proxy->readdata("measmag", "LOGMAG", trace);
     EXPECT_EQ(fake.log->calls.back(), "measurement measmag.readData(2,1,21)");
     redefined->status = 5;  // proves the read went to the redefined object
-    EXPECT_THAT(RAISED_TEXT(proxy->readdata("measmag", "LOGMAG", trace)),
+    EXPECT_THAT(errorOf([&] { proxy->readdata("measmag", "LOGMAG", trace); }),
                 ::testing::EndsWith("failed with status 5"));
-    EXPECT_THAT(RAISED_TEXT(proxy->readdata("measratio", "LOGMAG", trace)),
+    EXPECT_THAT(errorOf([&] { proxy->readdata("measratio", "LOGMAG", trace); }),
                 ::testing::HasSubstr("no such measurement among the 1 last listed"));
 
     proxy->clearmeasurements();
-    EXPECT_THAT(RAISED_TEXT(proxy->readdata("measmag", "LOGMAG", trace)),
+    EXPECT_THAT(errorOf([&] { proxy->readdata("measmag", "LOGMAG", trace); }),
                 ::testing::HasSubstr("no such measurement among the 0 last listed"));
 
     fake.collection->items = {std::make_shared<automation::Object>()};
-    EXPECT_EQ(RAISED_TEXT(proxy->refreshmeasurements()),
+    EXPECT_EQ(errorOf([&] { proxy->refreshmeasurements(); }),
               "CNetworkAnalyzer::refreshmeasurements: measurement 1 of 1 offers no measurement "
               "data");
 }
@@ -98,7 +98,7 @@ TEST_F(TraceTest, CurrentMeasurementValue) {
     EXPECT_EQ(proxy->readcurrentvalue("PHASE"), 2000.0f);
     EXPECT_EQ(fake.log->calls.back(), "measurement CH1_S11_1.readData(2,2,21)");
     fake.current->status = 3;
-    EXPECT_EQ(RAISED_TEXT(proxy->readcurrentvalue("logmag")),
+    EXPECT_EQ(errorOf([&] { proxy->readcurrentvalue("logmag"); }),
               "CNetworkAnalyzer::readdata LOGMAG of measurement \"CH1_S11_1\" failed with "
               "status 3");
 }
