@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include <fstream>
+#include <map>
 #include <sstream>
 
 #include "ErrorOf.h"
@@ -23,13 +23,35 @@ std::vector<std::string> lines(const std::string& text) {
     return result;
 }
 
+// What one search reports: found, the start index it leaves, and the stop flag.
+struct Found {
+    bool found;
+    int start;
+    bool stop;
+    bool operator==(const Found&) const = default;
+};
+
+void PrintTo(const Found& r, std::ostream* out) {
+    *out << "{found " << r.found << ", start " << r.start << ", stop " << r.stop << "}";
+}
+
+// stop starts true: every search must set it.
+Found search(CCompressionData& store, float level, float tolerance, bool first, int start = -1,
+             int frequency = 0) {
+    bool stop = true;
+    const bool found = store.findCompressionPoint(level, tolerance, frequency, first, start, stop);
+    return {found, start, stop};
+}
+
+constexpr CCompressionData::Limits kPlain{10.0, 1.0, 0.5f, 1e12, false, false};
+
 // A store with one frequency and the given readings per power level (lowest power first).
 struct OneFrequency {
     platform::ScriptedOperatorUi ui;
     CCompressionData store{ui};
 
     OneFrequency(std::vector<float> test, std::vector<float> ratio, std::vector<float> phase,
-                 CCompressionData::Limits limits = {10.0, 1.0, 0.5f, 1e12, false, false}) {
+                 CCompressionData::Limits limits = kPlain) {
         store.setLimits(limits);
         store.setFrequencies({1e9}, {});
         store.setPowerLevels(std::vector<double>(test.size(), 0.0));
@@ -41,8 +63,8 @@ struct OneFrequency {
         }
     }
 
-    bool search(float level, float tolerance, bool first, int& start, bool& stop) {
-        return store.findCompressionPoint(level, tolerance, 0, first, start, stop);
+    Found search(float level, float tolerance, bool first, int start = -1) {
+        return ::search(store, level, tolerance, first, start);
     }
 };
 
@@ -121,117 +143,87 @@ TEST(WrapPhase, FoldsWholeTurnsAndTheOuterBand) {
     EXPECT_FLOAT_EQ(engine::wrapPhase(-719.5f), 0.5f);
 }
 
-TEST(FindCompressionPoint, DownwardSearchSettlesOnFirstLevelWithinTolerance) {
+TEST(FindCompressionPoint, DownwardSearchThenUpwardWalkPerLevel) {
     // Levels from low to high power: linear, then compressing.
     OneFrequency data({-20, -15, -10.05f, -5.2f, -0.6f}, {-0.001f, -0.01f, -0.05f, -0.2f, -0.6f},
                       {0, 0, 0.5f, 1, 370});
-    int start = -1;
-    bool stop = true;
-    EXPECT_TRUE(data.search(0.05f, 0.006f, true, start, stop));
-    EXPECT_FALSE(stop);
-    EXPECT_EQ(start, 2);
+    EXPECT_EQ(data.search(0.05f, 0.006f, true), (Found{true, 2, false}));
     EXPECT_FLOAT_EQ(data.store.compressionPower(), -10.05f);
     EXPECT_FLOAT_EQ(data.store.compressionValue(), -0.05f);
     EXPECT_FLOAT_EQ(data.store.compressionPhase(), 0.5f);
-
-    // The next level walks upward from the level after.
-    start = 3;
-    EXPECT_TRUE(data.search(0.1f, 0.008f, false, start, stop));
-    EXPECT_EQ(start, 3);
+    EXPECT_EQ(data.search(0.1f, 0.008f, false, 3), (Found{true, 3, false}));
     EXPECT_FLOAT_EQ(data.store.compressionValue(), -0.2f);
-
-    start = 4;
-    EXPECT_TRUE(data.search(0.5f, 0.01f, false, start, stop));
+    EXPECT_EQ(data.search(0.5f, 0.01f, false, 4), (Found{true, 4, false}));
     EXPECT_FLOAT_EQ(data.store.compressionPhase(), 10);  // 370 wrapped
-}
 
-TEST(FindCompressionPoint, ClipAndDeltaDecideUsabilityAndStop) {
-    // Every level at or above the clip: nothing usable, power lowered to the clip.
-    OneFrequency clipped({11, 12, 13}, {-0.1f, -0.2f, -0.3f}, {0, 0, 0});
-    int start = -1;
-    bool stop = false;
-    EXPECT_FALSE(clipped.search(0.05f, 0.006f, true, start, stop));
-    EXPECT_FLOAT_EQ(clipped.store.compressionValue(), 0);
-    EXPECT_FLOAT_EQ(clipped.store.compressionPower(), 10);
-    EXPECT_TRUE(stop);
-
-    // A level found within delta of the clip stops the higher levels.
-    OneFrequency nearClip({5, 9.5f}, {-0.01f, -0.11f}, {0, 0});
-    start = 0;
-    EXPECT_TRUE(nearClip.search(0.1f, 0.008f, false, start, stop));
-    EXPECT_EQ(start, 1);
-    EXPECT_TRUE(stop);
-
-    // Positive ratio readings are never usable.
-    OneFrequency positive({-10, -5}, {0.2f, 0.3f}, {0, 0});
-    start = -1;
-    EXPECT_FALSE(positive.search(0.05f, 0.006f, true, start, stop));
-    EXPECT_FLOAT_EQ(positive.store.compressionPower(), -5);
-}
-
-TEST(FindCompressionPoint, OptionFlagAndPhaseDecideAShallowTopLevel) {
-    CCompressionData::Limits plain{10.0, 1.0, 0.5f, 1e12, false, false};
-    CCompressionData::Limits option = plain;
-    option.option210 = true;
-
-    int start = -1;
-    bool stop = false;
-    OneFrequency withoutOption({-10, -5}, {0.1f, -0.03f}, {0, 0}, plain);
-    EXPECT_FALSE(withoutOption.search(0.05f, 0.006f, true, start, stop));
-    OneFrequency withOption({-10, -5}, {0.1f, -0.03f}, {0, 0}, option);
-    EXPECT_TRUE(withOption.search(0.05f, 0.006f, true, start, stop));
-    EXPECT_FLOAT_EQ(withOption.store.compressionValue(), -0.03f);
-
-    OneFrequency phaseLarge({-10, -5}, {0.1f, -0.005f}, {0, 0.2f}, option);
-    EXPECT_TRUE(phaseLarge.search(0.05f, 0.006f, true, start, stop));
-    EXPECT_FLOAT_EQ(phaseLarge.store.compressionValue(), 0.00001f);
-    OneFrequency phaseSmall({-10, -5}, {0.1f, -0.005f}, {0, 0.05f}, option);
-    EXPECT_FALSE(phaseSmall.search(0.05f, 0.006f, true, start, stop));
-
-    // Other levels never get the option's leniency.
-    OneFrequency otherLevel({-10, -5}, {0.1f, -0.03f}, {0, 0.5f}, option);
-    EXPECT_FALSE(otherLevel.search(0.1f, 0.008f, true, start, stop));
-}
-
-TEST(FindCompressionPoint, UpwardWalkFallsBackToMostCompressedAndT3951Fall) {
-    // Compression never reaches 0.5 dB; the deepest reading was at level 1.
+    // Compression never reaches 0.5 dB: the deepest reading (level 1) is reported.
     OneFrequency shallow({-10, -5, 0}, {-0.05f, -0.3f, -0.2f}, {1, 2, 3});
-    int start = 0;
-    bool stop = false;
-    EXPECT_FALSE(shallow.search(0.5f, 0.01f, false, start, stop));
+    EXPECT_EQ(shallow.search(0.5f, 0.01f, false, 0), (Found{false, 0, false}));  // best - 1
     EXPECT_FLOAT_EQ(shallow.store.compressionPower(), -5);
     EXPECT_FLOAT_EQ(shallow.store.compressionValue(), -0.3f);
     EXPECT_FLOAT_EQ(shallow.store.compressionPhase(), 2);
-    EXPECT_EQ(start, 0);  // best - 1
-
     // A start index past the top is pulled back to the top level.
-    start = 7;
-    EXPECT_TRUE(shallow.search(0.2f, 0.01f, false, start, stop));
-    EXPECT_EQ(start, 2);
+    EXPECT_EQ(shallow.search(0.2f, 0.01f, false, 7), (Found{true, 2, false}));
+}
 
+TEST(FindCompressionPoint, UsabilityClipOptionAndModelRules) {
+    auto option = kPlain;
+    option.option210 = true;
+    auto t3951 = kPlain;
+    t3951.t3951 = true;
+    const std::map<float, float> tolerance = {{0.05f, 0.006f}, {0.1f, 0.008f}, {0.5f, 0.01f}};
+    // One frequency's readings from low to high power, searched once for one level.
+    const auto expect = [&](const char* what, std::vector<float> test, std::vector<float> ratio,
+                            std::vector<float> phase, CCompressionData::Limits limits, float level,
+                            bool first, int start, Found found, float value) {
+        OneFrequency data(test, ratio, phase, limits);
+        EXPECT_EQ(data.search(level, tolerance.at(level), first, start), found) << what;
+        EXPECT_FLOAT_EQ(data.store.compressionValue(), value) << what;
+    };
+    // Every level at or above the clip: nothing usable, and the stop flag is raised.
+    expect("clipped", {11, 12, 13}, {-0.1f, -0.2f, -0.3f}, {0, 0, 0}, kPlain, 0.05f, true, -1,
+           {false, -1, true}, 0);
+    // A level found within delta of the clip stops the higher levels.
+    expect("near clip", {5, 9.5f}, {-0.01f, -0.11f}, {0, 0}, kPlain, 0.1f, false, 0,
+           {true, 1, true}, -0.11f);
+    expect("positive ratio", {-10, -5}, {0.2f, 0.3f}, {0, 0}, kPlain, 0.05f, true, -1,
+           {false, -1, false}, 0);
+    // A shallow top level passes at 0.05 dB only with the option...
+    expect("no option", {-10, -5}, {0.1f, -0.03f}, {0, 0}, kPlain, 0.05f, true, -1,
+           {false, 1, false}, -0.03f);
+    expect("option", {-10, -5}, {0.1f, -0.03f}, {0, 0}, option, 0.05f, true, -1, {true, 1, false},
+           -0.03f);
+    // ...or, shallower still, with a large phase, reported as a token value.
+    expect("large phase", {-10, -5}, {0.1f, -0.005f}, {0, 0.2f}, option, 0.05f, true, -1,
+           {true, 1, false}, 0.00001f);
+    expect("small phase", {-10, -5}, {0.1f, -0.005f}, {0, 0.05f}, option, 0.05f, true, -1,
+           {false, 1, false}, -0.005f);
+    expect("other level", {-10, -5}, {0.1f, -0.03f}, {0, 0.5f}, option, 0.1f, true, -1,
+           {false, 1, false}, -0.03f);
     // On T3951 a reading that falls while the power rises ends the walk unreached.
-    CCompressionData::Limits t3951{10.0, 1.0, 0.5f, 1e12, true, false};
-    OneFrequency falling({-10, -10.5f, -9}, {-0.01f, -0.02f, -0.6f}, {0, 0, 0}, t3951);
-    start = 0;
-    EXPECT_FALSE(falling.search(0.5f, 0.01f, false, start, stop));
-    EXPECT_EQ(start, 1);
-    OneFrequency rising({-10, -9.9f, -9}, {-0.01f, -0.02f, -0.6f}, {0, 0, 0}, t3951);
-    start = 0;
-    EXPECT_TRUE(rising.search(0.5f, 0.01f, false, start, stop));
+    expect("T3951 falling", {-10, -10.5f, -9}, {-0.01f, -0.02f, -0.6f}, {0, 0, 0}, t3951, 0.5f,
+           false, 0, {false, 1, false}, -0.02f);
+    expect("T3951 rising", {-10, -9.9f, -9}, {-0.01f, -0.02f, -0.6f}, {0, 0, 0}, t3951, 0.5f, false,
+           0, {true, 2, false}, -0.6f);
+
+    // Nothing usable: the power reported is the top level's, lowered to the clip.
+    OneFrequency clipped({11, 12, 13}, {-0.1f, -0.2f, -0.3f}, {0, 0, 0});
+    clipped.search(0.05f, 0.006f, true);
+    EXPECT_FLOAT_EQ(clipped.store.compressionPower(), 10);
+    OneFrequency positive({-10, -5}, {0.2f, 0.3f}, {0, 0});
+    positive.search(0.05f, 0.006f, true);
+    EXPECT_FLOAT_EQ(positive.store.compressionPower(), -5);
 }
 
 TEST(FindCompressionPoint, ShortRowsAreNeverReadPastTheirEnd) {
     platform::ScriptedOperatorUi ui;
     CCompressionData store(ui);
-    store.setLimits({10.0, 1.0, 0.5f, 1e12, false, false});
+    store.setLimits(kPlain);
     store.setPowerLevels({-10, -5, 0});
     store.putTrace("TestMag", std::vector<float>{-10, -9}, 0);
     store.putTrace("RatioMag", std::vector<float>{-0.06f, -0.07f}, 0);
     store.putTrace("Phase", std::vector<float>{0, 0}, 0);
-    int start = -1;
-    bool stop = false;
     // Only level 0 exists, and frequency 5 lies beyond every row.
-    EXPECT_TRUE(store.findCompressionPoint(0.05f, 0.006f, 1, true, start, stop));
-    EXPECT_EQ(start, 0);
-    EXPECT_FALSE(store.findCompressionPoint(0.05f, 0.006f, 5, true, start, stop));
+    EXPECT_EQ(search(store, 0.05f, 0.006f, true, -1, 1), (Found{true, 0, false}));
+    EXPECT_EQ(search(store, 0.05f, 0.006f, true, 0, 5), (Found{false, 0, false}));
 }
