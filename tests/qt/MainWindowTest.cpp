@@ -99,9 +99,10 @@ void expectInOrder(const std::vector<QString>& seen, const std::vector<QString>&
     }
 }
 
-TEST(QtMainWindow, ControlsLabelsAndPositionsFollowTheTemplate) {
+TEST(QtMainWindow, ControlsFollowTheTemplateAndSelectAllClearAllAndAboutWork) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
+    QString aboutVersion;
     runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
         whenIdle(op, w, [&] {
             EXPECT_EQ(w.windowTitle(), "Receiver Characterization");
@@ -153,8 +154,7 @@ TEST(QtMainWindow, ControlsLabelsAndPositionsFollowTheTemplate) {
                 expected << QString::fromStdString(name);
             }
             EXPECT_EQ(names, expected);
-            EXPECT_TRUE(names.contains("R1"));
-            EXPECT_TRUE(names.contains("A"));
+            EXPECT_TRUE(names.contains("R1") && names.contains("A"));
 
             auto* prompt = w.findChild<QLabel*>("selectPrompt");
             ASSERT_NE(prompt, nullptr);
@@ -167,28 +167,14 @@ TEST(QtMainWindow, ControlsLabelsAndPositionsFollowTheTemplate) {
             EXPECT_EQ(actions.back()->text(), "&About Receiver Characterization...");
             EXPECT_FALSE(w.windowIcon().isNull());
             EXPECT_FALSE(w.runTimer().isActive());
-            click(w, 1);
-        });
-    });
-    // Exit without a run: no question and no restart.
-    EXPECT_TRUE(op.seen().empty());
-    EXPECT_FALSE(bench.signals.restartRequested);
-}
 
-TEST(QtMainWindow, SelectAllClearAllAndTheAboutBoxFromTheWindowMenu) {
-    qttest::WindowBench bench;
-    qttest::WindowOperator op;
-    QString aboutVersion;
-    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
-        whenIdle(op, w, [&] {
             click(w, 1003);
             EXPECT_TRUE(w.controller()->selectedReceivers().empty());
-            EXPECT_TRUE(control<QListWidget>(w, 1005)->selectedItems().isEmpty());
+            EXPECT_TRUE(list->selectedItems().isEmpty());
             clickReceiver(w, "A");
             EXPECT_EQ(w.controller()->selectedReceivers(), std::vector<std::string>{"A"});
             click(w, 1002);
-            EXPECT_EQ(control<QListWidget>(w, 1005)->selectedItems().size(),
-                      control<QListWidget>(w, 1005)->count());
+            EXPECT_EQ(list->selectedItems().size(), list->count());
             w.aboutAction().trigger();
         });
         op.then(
@@ -205,12 +191,15 @@ TEST(QtMainWindow, SelectAllClearAllAndTheAboutBoxFromTheWindowMenu) {
             [&] { click(w, 1); });
     });
     EXPECT_EQ(aboutVersion, "13.55.06.0");
+    // Exit without a run: no question and no restart.
+    EXPECT_TRUE(op.seen().empty());
+    EXPECT_FALSE(bench.signals.restartRequested);
 }
 
 TEST(QtMainWindow, TracedExampleRunsThroughTheWindowAndPlotsEachReceiver) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
-    op.answerOthersByDefault();
+    op.answerBoxesByDefault();
     QString log;
     QStringList plotted;
     runWindow(bench, op, [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
@@ -258,8 +247,7 @@ TEST(QtMainWindow, TracedExampleRunsThroughTheWindowAndPlotsEachReceiver) {
 TEST(QtMainWindow, AbortStaysUsableWhileAWorkerBoxIsOpen) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
-    op.answerOthersByDefault();
-    op.answer("Abort now?", {QMessageBox::Yes});
+    op.answerBoxesByDefault();  // "Abort now?" is confirmed by its default Yes
     op.hold("Connections");
     QString logAfterAbort;
     runWindow(bench, op, [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
@@ -291,7 +279,7 @@ TEST(QtMainWindow, AbortStaysUsableWhileAWorkerBoxIsOpen) {
 TEST(QtMainWindow, CloseDuringARunEndsOnlyAfterTheWorkerHasStopped) {
     qttest::WindowBench bench;
     qttest::WindowOperator op;
-    op.answerOthersByDefault();
+    op.answerBoxesByDefault();
     op.hold("Connections");
     bool workerRunningAtEnd = true;
     QString finalLog;
@@ -321,8 +309,8 @@ TEST(QtMainWindow, CloseDuringARunEndsOnlyAfterTheWorkerHasStopped) {
 TEST(QtMainWindow, BadDataDialogRetestShowsPleaseNoteAndMeasuresAgain) {
     qttest::WindowBench bench(R"("faults": {"bad_data": {"R1": 1}})");
     qttest::WindowOperator op;
-    op.answerOthersByDefault();
-    op.badData({1011});
+    op.answerBoxesByDefault();
+    op.badData(1011);
     QString log;
     runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
         whenIdle(op, w, [&] { runOnly(w, {"R1"}); });

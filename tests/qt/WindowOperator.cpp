@@ -23,15 +23,6 @@ WindowOperator::WindowOperator(std::chrono::milliseconds limit)
     connect(&m_poll, &QTimer::timeout, this, [this] { poll(); });
 }
 
-void WindowOperator::answer(const QString& caption,
-                            std::vector<QMessageBox::StandardButton> buttons) {
-    m_answers[caption] = std::deque<QMessageBox::StandardButton>(buttons.begin(), buttons.end());
-}
-
-void WindowOperator::badData(std::vector<int> buttonIds) {
-    m_badData = std::deque<int>(buttonIds.begin(), buttonIds.end());
-}
-
 void WindowOperator::then(std::string what, std::function<bool()> ready,
                           std::function<void()> act) {
     m_steps.push_back({std::move(what), std::move(ready), std::move(act)});
@@ -94,20 +85,12 @@ void WindowOperator::handleBox(QMessageBox& box) {
 }
 
 void WindowOperator::respond(QMessageBox& box) {
-    QMessageBox::StandardButton chosen = QMessageBox::NoButton;
-    auto rule = m_answers.find(box.windowTitle());
-    if (rule != m_answers.end() && !rule->second.empty()) {
-        chosen = rule->second.front();
-        if (rule->second.size() > 1) {
-            rule->second.pop_front();
-        }
-    } else if (m_defaultAnswers) {
-        chosen = box.standardButton(box.defaultButton());
-    } else {
-        ADD_FAILURE() << "No answer for the box \"" << box.windowTitle().toStdString()
+    if (!m_defaultAnswers) {
+        ADD_FAILURE() << "Unexpected box \"" << box.windowTitle().toStdString()
                       << "\": " << box.text().toStdString();
-        chosen = box.standardButton(box.escapeButton());
     }
+    const auto chosen =
+        box.standardButton(m_defaultAnswers ? box.defaultButton() : box.escapeButton());
     QPointer<QAbstractButton> button = box.button(chosen);
     ASSERT_TRUE(button) << "box \"" << box.windowTitle().toStdString() << "\" has no such button";
     QTimer::singleShot(0, button.data(), [button] { button->click(); });
@@ -116,11 +99,7 @@ void WindowOperator::respond(QMessageBox& box) {
 void WindowOperator::handleBadData(QWidget& dialog) {
     dialog.setProperty(kHandled, true);
     m_seen.push_back({dialog.windowTitle(), "", false});
-    const int id = m_badData.empty() ? 1010 : m_badData.front();
-    if (m_badData.size() > 1) {
-        m_badData.pop_front();
-    }
-    auto* button = qobject_cast<QAbstractButton*>(qtui::controlById(dialog, id));
+    auto* button = qobject_cast<QAbstractButton*>(qtui::controlById(dialog, m_badDataButton));
     ASSERT_NE(button, nullptr);
     QPointer<QAbstractButton> target = button;
     QTimer::singleShot(0, button, [target] { target->click(); });

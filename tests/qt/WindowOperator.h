@@ -1,7 +1,7 @@
 #pragma once
 
-// Plays the operator on the real widgets: answers every message box and bad-data dialog
-// that appears (by caption, from a script), and performs a list of steps, each once its
+// Plays the operator on the real widgets: answers every message box (default button) and
+// bad-data dialog (scripted) that appears, and performs a list of steps, each once its
 // condition holds. Actions are posted, never run inside the polling timer, so a modal box
 // they open does not stop the polling.
 
@@ -12,7 +12,6 @@
 #include <chrono>
 #include <deque>
 #include <functional>
-#include <map>
 #include <string>
 #include <vector>
 
@@ -29,12 +28,10 @@ class WindowOperator : public QObject {
 
     explicit WindowOperator(std::chrono::milliseconds limit = std::chrono::seconds(30));
 
-    // Answers for one caption, used in order; the last one repeats.
-    void answer(const QString& caption, std::vector<QMessageBox::StandardButton> buttons);
-    // Boxes without a rule get their default button (OK, Yes).
-    void answerOthersByDefault() { m_defaultAnswers = true; }
-    // The bad-data dialog's buttons by control id, in order; the last one repeats.
-    void badData(std::vector<int> buttonIds);
+    // Boxes get their default button (OK, Yes); without this call a box is a failure.
+    void answerBoxesByDefault() { m_defaultAnswers = true; }
+    // The bad-data dialog's button to press, by control id ("Don't retest" unless set).
+    void badData(int buttonId) { m_badDataButton = buttonId; }
     // Leaves the next box with this caption open until release() is called.
     void hold(const QString& caption) { m_holdCaption = caption; }
     void release() { m_holding = false; }
@@ -65,8 +62,7 @@ class WindowOperator : public QObject {
 
     QTimer m_poll;
     std::chrono::steady_clock::time_point m_deadline;
-    std::map<QString, std::deque<QMessageBox::StandardButton>> m_answers;
-    std::deque<int> m_badData;
+    int m_badDataButton = 1010;
     bool m_defaultAnswers = false;
     QString m_holdCaption;
     QPointer<QMessageBox> m_held;
