@@ -6,6 +6,7 @@
 #include <QMessageBox>
 #include <QPushButton>
 #include <QTimer>
+#include <array>
 #include <cstdlib>
 #include <future>
 #include <thread>
@@ -27,7 +28,7 @@ using platform::Answer;
 using platform::BadDataChoice;
 using platform::Buttons;
 
-// Runs the Qt loop until done() or a second has passed.
+// Runs the Qt loop until done() or five seconds have passed.
 bool spinUntil(const std::function<bool()>& done) {
     const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(5);
     while (!done()) {
@@ -133,31 +134,32 @@ TEST_F(QtDialogs, RestartNoticeShowsItsText) {
 }
 
 TEST_F(QtDialogs, BoxesMapCaptionTextButtonsAndAnswers) {
-    const platform::MessageBox yesNo{"Delete?\nSecond line", "Delete previous calibrations?",
-                                     Buttons::YesNo,
-                                     platform::BoxTopmost | platform::BoxIconInformation};
-    auto box = qtui::QtOperatorUi::makeBox(yesNo, nullptr);
-    EXPECT_EQ(box->windowTitle(), "Delete previous calibrations?");
-    EXPECT_EQ(box->text(), "Delete?\nSecond line");
-    EXPECT_EQ(box->textFormat(), Qt::PlainText);
-    EXPECT_EQ(box->standardButtons(), QMessageBox::Yes | QMessageBox::No);
-    EXPECT_EQ(box->standardButton(box->defaultButton()), QMessageBox::Yes);
-    EXPECT_EQ(box->icon(), QMessageBox::Information);
-    EXPECT_TRUE(box->windowFlags() & Qt::WindowStaysOnTopHint);
-    // Not answered by a button (closed): the escape answer.
-    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, Buttons::YesNo), Answer::No);
-    box->button(QMessageBox::Yes)->click();
-    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, Buttons::YesNo), Answer::Yes);
-
-    auto ok = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::Ok, 0}, nullptr);
-    EXPECT_EQ(ok->standardButtons(), QMessageBox::Ok);
-    EXPECT_EQ(ok->icon(), QMessageBox::NoIcon);
-    EXPECT_FALSE(ok->windowFlags() & Qt::WindowStaysOnTopHint);
-    auto okCancel = qtui::QtOperatorUi::makeBox({"t", "c", Buttons::OkCancel, 0}, nullptr);
-    EXPECT_EQ(okCancel->standardButtons(), QMessageBox::Ok | QMessageBox::Cancel);
-    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Cancel);
-    okCancel->button(QMessageBox::Ok)->click();
-    EXPECT_EQ(qtui::QtOperatorUi::answerOf(*okCancel, Buttons::OkCancel), Answer::Ok);
+    // closed: the answer when no button was pressed; pressed: that of the default button.
+    const auto expect = [](Buttons buttons, unsigned flags, QMessageBox::StandardButtons shown,
+                           QMessageBox::Icon icon, QMessageBox::StandardButton defaultButton,
+                           Answer pressed, Answer closed) {
+        SCOPED_TRACE(static_cast<int>(buttons));
+        auto box = qtui::QtOperatorUi::makeBox({"Delete?\nSecond line", "Delete?", buttons, flags},
+                                               nullptr);
+        EXPECT_EQ(box->windowTitle(), "Delete?");
+        EXPECT_EQ(box->text(), "Delete?\nSecond line");
+        EXPECT_EQ(box->textFormat(), Qt::PlainText);
+        EXPECT_EQ(box->standardButtons(), shown);
+        EXPECT_EQ(box->icon(), icon);
+        EXPECT_EQ(bool(box->windowFlags() & Qt::WindowStaysOnTopHint),
+                  bool(flags & platform::BoxTopmost));
+        EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, buttons), closed);
+        EXPECT_EQ(box->standardButton(box->defaultButton()), defaultButton);
+        box->button(defaultButton)->click();
+        EXPECT_EQ(qtui::QtOperatorUi::answerOf(*box, buttons), pressed);
+    };
+    expect(Buttons::YesNo, platform::BoxTopmost | platform::BoxIconInformation,
+           QMessageBox::Yes | QMessageBox::No, QMessageBox::Information, QMessageBox::Yes,
+           Answer::Yes, Answer::No);
+    expect(Buttons::OkCancel, 0, QMessageBox::Ok | QMessageBox::Cancel, QMessageBox::NoIcon,
+           QMessageBox::Ok, Answer::Ok, Answer::Cancel);
+    expect(Buttons::Ok, 0, QMessageBox::Ok, QMessageBox::NoIcon, QMessageBox::Ok, Answer::Ok,
+           Answer::Ok);
 }
 
 TEST_F(QtDialogs, UiThreadBoxIsModalAndReturnsTheButtonPressed) {
@@ -188,6 +190,16 @@ TEST_F(QtDialogs, WorkerBoxLeavesTheUiThreadFreeAndOnlyTheWorkerWaits) {
     box->button(QMessageBox::Cancel)->click();
     EXPECT_EQ(answer.get(), Answer::Cancel);
     EXPECT_EQ(ui.openWorkerBoxes(), 0u);
+
+    // Closing the worker's boxes releases it with the closed answer, now and later.
+    auto closed = askFromWorker(ui, "Check Connection", Buttons::YesNo);
+    ui.closeWorkerBoxes();
+    EXPECT_EQ(closed.get(), Answer::No);
+    EXPECT_EQ(visibleBox("Check Connection"), nullptr);
+    auto later = std::async(std::launch::async, [&] {
+        return ui.messageBox({"Again", "Connections", Buttons::OkCancel, 0});
+    });
+    EXPECT_EQ(later.get(), Answer::Cancel);
 }
 
 TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
@@ -219,19 +231,6 @@ TEST_F(QtDialogs, WorkerBadDataDialogShowsPleaseNoteOwnedByTheDialog) {
     EXPECT_EQ(owner, dialog);
 }
 
-TEST_F(QtDialogs, ClosingWorkerBoxesReleasesTheWaitingWorker) {
-    qtui::QtOperatorUi ui;
-    auto answer = askFromWorker(ui, "Check Connection", Buttons::YesNo);
-    ui.closeWorkerBoxes();
-    EXPECT_EQ(answer.get(), Answer::No);
-    EXPECT_EQ(visibleBox("Check Connection"), nullptr);
-    // Later boxes from the worker are answered at once, as closed.
-    auto later = std::async(std::launch::async, [&] {
-        return ui.messageBox({"Again", "Connections", Buttons::OkCancel, 0});
-    });
-    EXPECT_EQ(later.get(), Answer::Cancel);
-}
-
 TEST(QtRunProgress, CompletionIsReportedForTheReceiverUnderWay) {
     qtui::RunProgressWatcher watcher;
     EXPECT_EQ(watcher.onNotice("Cal Started\r\n"), std::nullopt);
@@ -245,42 +244,31 @@ TEST(QtRunProgress, CompletionIsReportedForTheReceiverUnderWay) {
     EXPECT_EQ(watcher.onNotice("Cal Complete\r\n"), std::nullopt);
 }
 
-using Environment = std::vector<std::pair<std::string, std::optional<std::string>>>;
-
-// Sets or clears environment variables for one test and restores them.
-struct EnvironmentScope {
-    explicit EnvironmentScope(const Environment& values) {
-        for (const auto& [name, value] : values) {
-            const char* old = std::getenv(name.c_str());
-            saved.emplace_back(name, old ? std::optional<std::string>(old) : std::nullopt);
-            set(name, value);
-        }
-    }
-    ~EnvironmentScope() {
-        for (const auto& [name, value] : saved) {
-            set(name, value);
-        }
-    }
-    static void set(const std::string& name, const std::optional<std::string>& value) {
-        value ? setenv(name.c_str(), value->c_str(), 1) : unsetenv(name.c_str());
-    }
-    Environment saved;
-};
-
 TEST(QtDisplay, MissingDisplayIsExplained) {
-    const std::optional<std::string> unset;
-    const std::vector<std::pair<Environment, std::optional<std::string>>> cases = {
-        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", unset}, {"DISPLAY", unset}},
-         "no display: neither DISPLAY nor WAYLAND_DISPLAY is set"},
-        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", unset}, {"DISPLAY", ":4711.0"}},
+    using Value = std::optional<std::string>;
+    const Value unset;
+    const std::array<const char*, 3> names = {"QT_QPA_PLATFORM", "WAYLAND_DISPLAY", "DISPLAY"};
+    const std::vector<std::pair<std::array<Value, 3>, Value>> cases = {
+        {{unset, unset, unset}, "no display: neither DISPLAY nor WAYLAND_DISPLAY is set"},
+        {{unset, unset, ":4711.0"},
          "no display: DISPLAY is :4711.0 but no X server listens at /tmp/.X11-unix/X4711"},
-        {{{"QT_QPA_PLATFORM", "offscreen"}, {"DISPLAY", unset}}, unset},
-        {{{"QT_QPA_PLATFORM", unset}, {"WAYLAND_DISPLAY", "wayland-0"}}, unset},
+        {{"offscreen", unset, unset}, unset},
+        {{unset, "wayland-0", unset}, unset},
     };
+    const auto setAll = [&](const std::array<Value, 3>& values) {
+        for (std::size_t n = 0; n < names.size(); ++n) {
+            values[n] ? setenv(names[n], values[n]->c_str(), 1) : unsetenv(names[n]);
+        }
+    };
+    std::array<Value, 3> saved;
+    for (std::size_t n = 0; n < names.size(); ++n) {
+        saved[n] = std::getenv(names[n]) ? Value(std::getenv(names[n])) : unset;
+    }
     for (std::size_t i = 0; i < cases.size(); ++i) {
-        EnvironmentScope env(cases[i].first);
+        setAll(cases[i].first);
         EXPECT_EQ(qtui::missingDisplay(), cases[i].second) << "case " << i;
     }
+    setAll(saved);
 }
 
 }  // namespace
