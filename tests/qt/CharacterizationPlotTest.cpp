@@ -13,6 +13,7 @@
 #include "TempDir.h"
 #include "frontends/qt/CharacterizationChart.h"
 #include "frontends/qt/PlotRenderer.h"
+#include "storage/ExportText.h"
 
 namespace {
 
@@ -45,18 +46,9 @@ storage::RcvrCharImage knownImage() {
     return image;
 }
 
-std::string exportText(const qtui::CharacterizationData& data) {
+std::string exportText() {
     std::ostringstream out;
-    out.precision(12);
-    out << "1\n" << data.receiver << "\n25\n" << data.narrowbandLoss << "\n" << data.attenuator;
-    for (const auto& record : data.records) {
-        out.precision(15);
-        out << "\n" << record.frequency;
-        out.precision(8);
-        for (const auto& p : record.levels) {
-            out << ", (" << p.power << "," << p.value << "," << p.phase << ")";
-        }
-    }
+    EXPECT_TRUE(storage::writeExportText(out, knownImage()));
     return out.str();
 }
 
@@ -77,7 +69,7 @@ class CharacterizationPlot : public ::testing::Test {
     testsupport::TempDir dir;
 };
 
-TEST_F(CharacterizationPlot, ImageRecordsSplitIntoLowFrequenciesAndMeasuredBands) {
+TEST_F(CharacterizationPlot, RecordsSplitIntoLowFrequenciesAndBandsWithTheirEdges) {
     const auto data = qtui::fromImage(knownImage());
     EXPECT_EQ(data.receiver, "B");
     EXPECT_FLOAT_EQ(data.narrowbandLoss, 3.5);
@@ -85,17 +77,14 @@ TEST_F(CharacterizationPlot, ImageRecordsSplitIntoLowFrequenciesAndMeasuredBands
     ASSERT_EQ(data.records.size(), 12u);
     EXPECT_EQ(data.measuredRecords().size(), 10u);
     EXPECT_EQ(data.bandEdges(), (std::vector<double>{1e9, 2e9, 6e9}));
-}
 
-TEST_F(CharacterizationPlot, BandEdgesMarkBothEndsOfAGapBetweenBands) {
-    qtui::CharacterizationData data;
+    // A gap between bands is marked at both of its ends.
+    qtui::CharacterizationData gapped;
     for (double f : {1.0, 2.0, 3.0, 10.0, 15.0, 20.0}) {
-        qtui::CharacterizationRecord record;
-        record.frequency = f * 1e9;
-        record.levels[0].power = -5;
-        data.records.push_back(record);
+        gapped.records.push_back({.frequency = f * 1e9});
+        gapped.records.back().levels[0].power = -5;
     }
-    EXPECT_EQ(data.bandEdges(), (std::vector<double>{1e9, 3e9, 10e9, 20e9}));
+    EXPECT_EQ(gapped.bandEdges(), (std::vector<double>{1e9, 3e9, 10e9, 20e9}));
 }
 
 TEST_F(CharacterizationPlot, ChartsHaveOneSeriesPerLevelAndAxesSpanTheData) {
@@ -157,16 +146,18 @@ TEST_F(CharacterizationPlot, DefaultedCharacterizationStillDrawsWithANote) {
 
 TEST_F(CharacterizationPlot, ExportTextGivesTheSameChartDataAsTheImage) {
     const auto fromImage = qtui::fromImage(knownImage());
-    const auto parsed = qtui::parseExportText(exportText(fromImage));
-    EXPECT_EQ(parsed.receiver, "B");
-    ASSERT_EQ(parsed.records.size(), fromImage.records.size());
-    for (std::size_t i = 0; i < parsed.records.size(); ++i) {
-        EXPECT_DOUBLE_EQ(parsed.records[i].frequency, fromImage.records[i].frequency);
-        EXPECT_EQ(parsed.records[i].levels, fromImage.records[i].levels);
+    // Also with Windows line ends, as the analyzer's own platform writes them.
+    for (const auto& text :
+         {exportText(), std::regex_replace(exportText(), std::regex("\n"), "\r\n")}) {
+        const auto parsed = qtui::parseExportText(text);
+        EXPECT_EQ(parsed.receiver, "B");
+        EXPECT_FLOAT_EQ(parsed.narrowbandLoss, 3.5);
+        ASSERT_EQ(parsed.records.size(), fromImage.records.size());
+        for (std::size_t i = 0; i < parsed.records.size(); ++i) {
+            EXPECT_DOUBLE_EQ(parsed.records[i].frequency, fromImage.records[i].frequency);
+            EXPECT_EQ(parsed.records[i].levels, fromImage.records[i].levels);
+        }
     }
-    // Windows line ends, as the analyzer's own platform writes them.
-    const auto crlf = std::regex_replace(exportText(fromImage), std::regex("\n"), "\r\n");
-    EXPECT_EQ(qtui::parseExportText(crlf).records.size(), 12u);
 }
 
 TEST_F(CharacterizationPlot, MalformedInputIsReportedWithWhatWasWrong) {
@@ -194,7 +185,7 @@ TEST_F(CharacterizationPlot, MalformedInputIsReportedWithWhatWasWrong) {
 
 TEST_F(CharacterizationPlot, FilesOfEitherKindRenderToPngAndSvgOfTheAskedSize) {
     writeFile(dir / "RcvrCharTest.dat", knownImage().bytes());
-    writeFile(dir / "RcvrChar_B_Exported.txt", exportText(qtui::fromImage(knownImage())));
+    writeFile(dir / "RcvrChar_B_Exported.txt", exportText());
 
     const auto png = dir / "power.png";
     qtui::plotCharacterizationFile(dir / "RcvrCharTest.dat", png, ChartView::CompressionPower,
@@ -203,13 +194,13 @@ TEST_F(CharacterizationPlot, FilesOfEitherKindRenderToPngAndSvgOfTheAskedSize) {
     ASSERT_FALSE(image.isNull());
     EXPECT_EQ(image.size(), QSize(800, 500));
     // Something besides the white background was drawn.
-    bool drawn = false;
-    for (int y = 0; y < image.height() && !drawn; y += 5) {
-        for (int x = 0; x < image.width() && !drawn; x += 5) {
-            drawn = image.pixel(x, y) != qRgb(255, 255, 255);
+    int drawn = 0;
+    for (int y = 0; y < image.height(); y += 5) {
+        for (int x = 0; x < image.width(); x += 5) {
+            drawn += image.pixel(x, y) != qRgb(255, 255, 255);
         }
     }
-    EXPECT_TRUE(drawn);
+    EXPECT_GT(drawn, 0);
 
     const auto svg = dir / "phase.SVG";
     qtui::plotCharacterizationFile(dir / "RcvrChar_B_Exported.txt", svg,
