@@ -209,8 +209,6 @@ TEST_F(SequenceReader, FaultsAreNamedWithFileBlockAndColumn) {
         {"3000000000,10,0", "3000000000,1,0",
          "Band 3 of block \"BANDED\" has 1 points in @; a band needs 0 or at least 2"},
         {"BandNum,", "Band,", "Column \"BandNum\" is missing from block \"BANDED\" in @"},
-        {",Check,500,11,0.1,2,5,", ",Check,500,11,0.1,2,7,",
-         "CCalibration::AddSub Unable to add sub Check position all ready Exists"},
         {",Test Power,\"-20,4\"", ",Test Power,-20",
          "The \"Order / Power\" row \"Test Power\" of model T3872A in @ needs two powers, start "
          "and stop, but reads \"-20\""},
@@ -220,8 +218,6 @@ TEST_F(SequenceReader, FaultsAreNamedWithFileBlockAndColumn) {
          "Column \"Port Names\" is missing from block \"REQUIRED PORTS\" of model T3872A in @"},
         {"Rec-B", "Rec-Q",
          "Column \"Rec-B\" is missing from block \"SUBS / CALIBRATION\" of model T3872A in @"},
-        {"Required Ports,Port Names,T3872", "Required Ports,Port Names,T3877",
-         "Column was not found, Partials searched forT3872 and that's it!"},
         {"T3871 T3872 T3877", "T3951", "Model T3872A is not listed in the first cell of @"},
         {"", "T3872\n\nT3872A,Value\nminband,2\n\n",
          "The table of model T3872A in @ needs at least two rows below the row naming the model"},
