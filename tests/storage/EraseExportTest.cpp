@@ -45,9 +45,7 @@ TEST(EraseCal, MillimetreWaveErrorBoxIsOwnedByTheDialog) {
     storage::eraseCal(bench.context(), *bench.processes, "R1 LOW FREQUENCY EXTENSION", findings);
     ASSERT_EQ(bench.ui.boxes().size(), 1u);
     EXPECT_EQ(bench.ui.boxes()[0].box.flags, platform::BoxSystemModal | platform::BoxOwnedByDialog);
-    EXPECT_EQ(bench.ui.boxes()[0].box.text, ",\"File name not found\"");
     EXPECT_EQ(bench.commands(), std::vector<std::string>{"diag:mm:data:push 1,0"});
-    EXPECT_EQ(bench.logLines().back(), ",\"File name not found\"");
     EXPECT_EQ(findings["R1 LOW FREQUENCY EXTENSION"], 3);
 }
 

@@ -125,7 +125,6 @@ TEST(PushPortFile, TwoAnalyzerErrorsShowInOneBoxAndInTheLog) {
     storage::pushPortFile(bench.context(), "A", imageOf("A", 2));
     auto boxes = bench.ui.boxes();
     ASSERT_EQ(boxes.size(), 1u);
-    EXPECT_EQ(boxes[0].box.caption, "SCPI Error Writing Flash");
     EXPECT_EQ(boxes[0].box.text, ",\"Execution error\"\n,\"Data out of range\"");
     EXPECT_EQ(boxes[0].box.buttons, platform::Buttons::Ok);
     EXPECT_EQ(boxes[0].box.flags, platform::BoxSystemModal);
