@@ -100,7 +100,6 @@ TEST_F(Bench, HealthyCablingPassesEveryCheck) {
     define("R1", "R1/A", 1);
     EXPECT_TRUE(connectionCheckPasses());
     EXPECT_NEAR(20.0, reading("measratio", -25.0), 0.05);
-    EXPECT_EQ("\"30\"", scpi("SENS:PATH:CONF:ELEM? \"NBFATNR1\""));
     // Moving the cable on gives R1 its jumper back.
     instruct("Connect cable from PORT 1 to \"RCVR A IN\" (with no pad).");
     EXPECT_DOUBLE_EQ(0.0, m_analyzer->instrument().connectionOf("R1").lossDb);

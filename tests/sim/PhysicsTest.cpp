@@ -28,7 +28,7 @@ class Physics : public SimFixture {
   protected:
     // A power sweep of `points` points from start to stop dBm at 1 GHz, measuring `parameter`.
     std::vector<float> powerSweep(const std::string& parameter, double start, double stop,
-                                  long points, int format = 1) {
+                                  long points) {
         scpi("CALC:PAR:DEL:ALL");
         scpi("CALC:PAR:DEF:EXT \"m\",\"" + parameter + "\"");
         auto ch = channel();
@@ -39,7 +39,7 @@ class Physics : public SimFixture {
         ch->setNumberOfPoints(points);
         ch->singleSweep();
         EXPECT_EQ("0,\"No error\"", nextError());
-        return read("m", format);
+        return read("m");
     }
     // CW sweeps of the given measurements ("name", "parameter") at the port's source power.
     std::shared_ptr<automation::Channel> cw(

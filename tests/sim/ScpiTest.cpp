@@ -9,10 +9,8 @@ namespace {
 using simtest::SimFixture;
 
 TEST(ScpiSyntax, SplitsUnitsOutsideQuotesAndReadsHeaders) {
-    auto units = sim::splitMessageUnits(" *IDN? ; SENS:PATH:CONF:ELEM \"a;b\",\"c\";");
-    ASSERT_EQ(2u, units.size());
-    EXPECT_EQ("*IDN?", units[0]);
-    EXPECT_EQ("SENS:PATH:CONF:ELEM \"a;b\",\"c\"", units[1]);
+    EXPECT_EQ((std::vector<std::string_view>{"*IDN?", "SENS:PATH:CONF:ELEM \"a;b\",\"c\""}),
+              sim::splitMessageUnits(" *IDN? ; SENS:PATH:CONF:ELEM \"a;b\",\"c\";"));
 
     auto header = sim::parseHeader(":SENSe1:AVERage:COUNt 5");
     EXPECT_FALSE(header.query);
