@@ -31,41 +31,28 @@ TEST_F(ProxyTest, PreparationSequence) {
     auto proxy = connect();
     fake.log->clear();
     proxy->preparecal();
-    const std::vector<std::string> manualPorts{
-        "channel.setAttenuatorMode(1,1)", "channel.setAttenuatorMode(2,1)",
-        "channel.setAttenuatorMode(3,1)", "channel.setAttenuatorMode(4,1)"};
-    std::vector<std::string> expected{"app.reset()",
-                                      "app.preset(1)",
-                                      "app.activeChannel()",
-                                      "channel.segmentTable()",
-                                      "scpi *IDN?",
-                                      "scpi *opt?",
-                                      "scpi diag:portcount?",
-                                      "app.currentMeasurement()",
-                                      "app.reset()",
-                                      "channel.startFrequency()",
-                                      "channel.stopFrequency()",
-                                      "app.currentMeasurement()",
-                                      "scpi CALC:PAR:DEL \"CH1_S11_1\"",
-                                      "scpi CALC:PAR:DEF:EXT \"CH1_S11_1\",\"R1,PORT 1\"",
-                                      "scpi DISP:WIND:TRACE:FEED \"CH1_S11_1\"",
-                                      "scpi SOUR:POW? \"PORT 1\"",
-                                      "channel.numberOfPoints()",
-                                      "app.currentMeasurement()"};
-    expected.insert(expected.end(), manualPorts.begin(), manualPorts.end());
-    for (const char* call : {"channel.setNumberOfPoints(21)", "channel.setIfBandwidth(1000)",
-                             "channel.setSweepType(3)", "channel.startFrequency()",
-                             "channel.stopFrequency()", "channel.setCwFrequency(0)"}) {
-        expected.push_back(call);
-    }
-    expected.insert(expected.end(), manualPorts.begin(), manualPorts.end());
-    for (const char* call :
-         {"app.setTriggerSetting(3)", "channel.setTriggerSetting(1)",
+    std::vector<std::string> expected;
+    auto then = [&](std::initializer_list<const char*> calls) {
+        expected.insert(expected.end(), calls.begin(), calls.end());
+    };
+    const auto manualPorts = {"channel.setAttenuatorMode(1,1)", "channel.setAttenuatorMode(2,1)",
+                              "channel.setAttenuatorMode(3,1)", "channel.setAttenuatorMode(4,1)"};
+    then({"app.reset()", "app.preset(1)", "app.activeChannel()", "channel.segmentTable()",
+          "scpi *IDN?", "scpi *opt?", "scpi diag:portcount?", "app.currentMeasurement()",
+          "app.reset()", "channel.startFrequency()", "channel.stopFrequency()",
+          "app.currentMeasurement()", "scpi CALC:PAR:DEL \"CH1_S11_1\"",
+          "scpi CALC:PAR:DEF:EXT \"CH1_S11_1\",\"R1,PORT 1\"",
+          "scpi DISP:WIND:TRACE:FEED \"CH1_S11_1\"", "scpi SOUR:POW? \"PORT 1\"",
+          "channel.numberOfPoints()", "app.currentMeasurement()"});
+    then(manualPorts);
+    then({"channel.setNumberOfPoints(21)", "channel.setIfBandwidth(1000)",
+          "channel.setSweepType(3)", "channel.startFrequency()", "channel.stopFrequency()",
+          "channel.setCwFrequency(0)"});
+    then(manualPorts);
+    then({"app.setTriggerSetting(3)", "channel.setTriggerSetting(1)",
           "channel.setContinuousSweep(true)", "scpi diag:eeupdatehw", "app.setTriggerSetting(3)",
           "channel.setTriggerSetting(1)", "channel.setContinuousSweep(true)",
-          "scpi diag:poke:long 9,3", "scpi diag:eeupdatehw"}) {
-        expected.push_back(call);
-    }
+          "scpi diag:poke:long 9,3", "scpi diag:eeupdatehw"});
     EXPECT_EQ(fake.log->calls, expected);
     EXPECT_EQ(proxy->readnumberofpoints(false), 21);
     EXPECT_EQ(proxy->sweeptype(), "cw");
