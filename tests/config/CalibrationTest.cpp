@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "ConfigTestFiles.h"
 #include "ErrorOf.h"
 #include "config/Calibration.h"
 
@@ -9,14 +10,6 @@ CSub sub(const std::string& name, int position) {
     CSub s(name);
     s.SetPosition(position);
     return s;
-}
-
-std::vector<int> positions(const CCalibration& calibration) {
-    std::vector<int> out;
-    for (const auto& s : calibration.GetSubs()) {
-        out.push_back(s.GetPosition());
-    }
-    return out;
 }
 
 TEST(CalibrationName, UpperCasedAndTrimmedOfBlanks) {
@@ -32,7 +25,7 @@ TEST(CalibrationSubSteps, KeptInPositionOrderWithParallelNames) {
     calibration.AddSub(sub("nine", 9));
     // One sub-step may stand at two positions; it counts twice.
     calibration.AddSub(sub("two", 7));
-    EXPECT_EQ(positions(calibration), (std::vector<int>{2, 5, 7, 9}));
+    EXPECT_EQ(configtest::positions(calibration), (std::vector<int>{2, 5, 7, 9}));
     EXPECT_EQ(calibration.GetSubNames(), (std::vector<std::string>{"two", "five", "two", "nine"}));
     EXPECT_EQ(calibration.SubCount(), 4);
 }

@@ -3,6 +3,9 @@
 // Small configuration texts shared by the configuration tests.
 
 #include <string>
+#include <vector>
+
+#include "config/Calibration.h"
 
 namespace configtest {
 
@@ -52,6 +55,15 @@ inline std::string replaced(std::string text, const std::string& what, const std
         throw std::string("test text lacks: ") + what;
     }
     return text.replace(at, what.size(), with);
+}
+
+// The positions of a calibration's sub-steps, in their order.
+inline std::vector<int> positions(const CCalibration& calibration) {
+    std::vector<int> out;
+    for (const auto& s : calibration.GetSubs()) {
+        out.push_back(s.GetPosition());
+    }
+    return out;
 }
 
 }  // namespace configtest

@@ -68,11 +68,7 @@ TEST_F(SequenceReader, CalibrationsAndSubStepsFromTheirRows) {
     EXPECT_EQ(b.GetPort(), "Port 2,B/R2,\"RCVR B IN\",Sweep B");
     EXPECT_EQ(b.GetCopyFrom(), "A");
     EXPECT_EQ(a.GetSubNames(), (Texts{"Sweep", "Check", "Sweep"}));
-    std::vector<int> positions;
-    for (const auto& sub : a.GetSubs()) {
-        positions.push_back(sub.GetPosition());
-    }
-    EXPECT_EQ(positions, (std::vector<int>{3, 5, 7}));
+    EXPECT_EQ(configtest::positions(a), (std::vector<int>{3, 5, 7}));
     EXPECT_EQ(a.GetSubs()[1].GetIFBW(), 500);
     EXPECT_EQ(a.GetSubs()[1].GetNumPoints(), 11);
     EXPECT_FLOAT_EQ(a.GetSubs()[1].GetTolerance(), 0.1F);
