@@ -59,7 +59,7 @@ TEST(CatalogAge, UnreadableDatesAreUndetermined) {
     }
 }
 
-TEST(CatalogReply, FindsReceiversByCalibrationNameAndAge) {
+TEST(CatalogReply, FindsReceiversByCalibrationNameAndAgeAndEmptyRepliesChangeNothing) {
     auto now = localTime(2026, 3, 10, 9, 30);
     CatalogFindings findings{
         {"R1", 0}, {"R2", 0}, {"A", 2}, {"B", 0}, {"R1 LOW FREQUENCY EXTENSION", 0}};
@@ -75,12 +75,9 @@ TEST(CatalogReply, FindsReceiversByCalibrationNameAndAge) {
     EXPECT_EQ(findings,
               (CatalogFindings{
                   {"R1", 0}, {"R2", 1}, {"A", 2}, {"B", 0}, {"R1 LOW FREQUENCY EXTENSION", 1}}));
-}
-
-TEST(CatalogReply, EmptyRepliesChangeNothing) {
     CatalogFindings untouched{{"B", 3}};
-    storage::applyCatalogReply("", kReceivers, untouched, localTime(2026, 3, 10, 12, 0));
-    storage::applyCatalogReply("\n\n  \n", kReceivers, untouched, localTime(2026, 3, 10, 12, 0));
+    storage::applyCatalogReply("", kReceivers, untouched, now);
+    storage::applyCatalogReply("\n\n  \n", kReceivers, untouched, now);
     EXPECT_EQ(untouched, (CatalogFindings{{"B", 3}}));
 }
 
