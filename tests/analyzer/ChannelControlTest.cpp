@@ -29,12 +29,8 @@ TEST_F(ProxyTest, SweepTypeIsSetOnceAndReadBack) {
     proxy->setsweeptype("segmentsweep");
     EXPECT_THAT(fake.log->calls, ElementsAre("channel.setSweepType(4)"));
 
-    try {
-        proxy->setsweeptype("Segmentsweep");
-        ADD_FAILURE() << "an unknown sweep type was accepted";
-    } catch (const char* text) {
-        EXPECT_STREQ(text, "Unrecognized Sweep Type in CNetworkAnalyzer");
-    }
+    EXPECT_EQ(errorOf([&] { proxy->setsweeptype("Segmentsweep"); }),
+              "Unrecognized Sweep Type in CNetworkAnalyzer");
     EXPECT_EQ(proxy->sweeptype(), "segmentsweep");
 }
 
