@@ -244,6 +244,14 @@ TEST_F(SequenceReader, ModelAndOptionsMustBeSetFirst) {
     EXPECT_EQ(error(noModel), "No Model Set in CNAData::GetSequence");
     noModel.SetModel("None Set");
     EXPECT_EQ(error(noModel), "No Model Set in CNAData::GetSequence");
+    // Callers written for the original catch these two as plain character strings and the
+    // file's own faults as string objects.
+    EXPECT_THROW(noModel.ReadSequence(path()), const char*);
+    EXPECT_THROW(noOptions.ReadSequence(path()), const char*);
+    CT3872Acomcal missingFile;
+    missingFile.SetModel("T3872A");
+    missingFile.SetOptions({"010"});
+    EXPECT_THROW(missingFile.ReadSequence(path() + ".absent"), std::string);
 }
 
 TEST(ModelToken, DropsUpToTwoCharacters) {
