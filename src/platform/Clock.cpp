@@ -13,7 +13,9 @@ std::chrono::milliseconds RealClock::totalWaited() const {
     return std::chrono::milliseconds(m_totalMs.load());
 }
 
-void VirtualClock::wait(std::chrono::milliseconds duration) { m_totalMs += duration.count(); }
+void VirtualClock::wait(std::chrono::milliseconds duration) {
+    m_totalMs += duration.count();
+}
 
 std::chrono::milliseconds VirtualClock::totalWaited() const {
     return std::chrono::milliseconds(m_totalMs.load());

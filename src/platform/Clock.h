@@ -9,7 +9,7 @@
 namespace platform {
 
 class Clock {
-public:
+  public:
     virtual ~Clock() = default;
     virtual void wait(std::chrono::milliseconds duration) = 0;
     // Total of every wait asked for so far.
@@ -17,20 +17,20 @@ public:
 };
 
 class RealClock final : public Clock {
-public:
+  public:
     void wait(std::chrono::milliseconds duration) override;
     std::chrono::milliseconds totalWaited() const override;
 
-private:
+  private:
     std::atomic<long long> m_totalMs{0};
 };
 
 class VirtualClock final : public Clock {
-public:
+  public:
     void wait(std::chrono::milliseconds duration) override;
     std::chrono::milliseconds totalWaited() const override;
 
-private:
+  private:
     std::atomic<long long> m_totalMs{0};
 };
 

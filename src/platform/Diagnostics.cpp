@@ -12,7 +12,9 @@ std::vector<iTalker*> g_talkers;
 
 }  // namespace
 
-iTalker::~iTalker() { CDiagnostic::UnregisterTalker(this); }
+iTalker::~iTalker() {
+    CDiagnostic::UnregisterTalker(this);
+}
 
 void CDiagnostic::RegisterTalker(iTalker* talker) {
     std::lock_guard lock(g_mutex);

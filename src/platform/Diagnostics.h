@@ -8,12 +8,12 @@
 namespace platform {
 
 class iTalker {
-public:
+  public:
     virtual ~iTalker();
 };
 
 class CDiagnostic {
-public:
+  public:
     static void RegisterTalker(iTalker* talker);
     static void UnregisterTalker(iTalker* talker);
     static std::size_t TalkerCount();

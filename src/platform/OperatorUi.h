@@ -31,7 +31,7 @@ struct MessageBox {
 enum class BadDataChoice { Retest, Quit, Continue };
 
 class OperatorUi {
-public:
+  public:
     virtual ~OperatorUi() = default;
     virtual Answer messageBox(const MessageBox& box) = 0;
     // Shows the bad-data dialog for one receiver and returns the button pressed

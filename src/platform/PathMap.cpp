@@ -8,8 +8,7 @@ DrivePathMap::DrivePathMap(std::filesystem::path workingDirectory)
     : m_workingDirectory(std::move(workingDirectory)) {}
 
 void DrivePathMap::mapDrive(char letter, std::filesystem::path root) {
-    m_drives[static_cast<char>(std::toupper(static_cast<unsigned char>(letter)))] =
-        std::move(root);
+    m_drives[static_cast<char>(std::toupper(static_cast<unsigned char>(letter)))] = std::move(root);
 }
 
 std::filesystem::path DrivePathMap::toLocal(const std::string& windowsPath) const {

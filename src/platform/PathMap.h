@@ -11,21 +11,21 @@
 namespace platform {
 
 class PathMap {
-public:
+  public:
     virtual ~PathMap() = default;
     // Raises an error text naming the path when it cannot be mapped (an unknown drive).
     virtual std::filesystem::path toLocal(const std::string& windowsPath) const = 0;
 };
 
 class DrivePathMap final : public PathMap {
-public:
+  public:
     explicit DrivePathMap(std::filesystem::path workingDirectory);
     // Drive letter (upper or lower case) to the local folder that stands in for its root.
     void mapDrive(char letter, std::filesystem::path root);
     std::filesystem::path toLocal(const std::string& windowsPath) const override;
     const std::filesystem::path& workingDirectory() const { return m_workingDirectory; }
 
-private:
+  private:
     std::filesystem::path m_workingDirectory;
     std::map<char, std::filesystem::path> m_drives;
 };

@@ -8,7 +8,7 @@
 namespace platform {
 
 class ProcessRunner {
-public:
+  public:
     virtual ~ProcessRunner() = default;
     // Starts the program of the command line (e.g. "\"C:\\...\\restartapp.exe\"") and
     // waits for it to end; returns its exit code. Raises an error text when it cannot start.

@@ -15,7 +15,7 @@
 namespace platform {
 
 class ScriptedOperatorUi : public OperatorUi {
-public:
+  public:
     struct Record {
         MessageBox box;
         Answer answer;
@@ -34,7 +34,7 @@ public:
     // Captions of the recorded boxes, in order.
     std::vector<std::string> captions() const;
 
-private:
+  private:
     mutable std::mutex m_mutex;
     std::map<std::string, std::deque<Answer>> m_answers;
     std::optional<Answer> m_default;

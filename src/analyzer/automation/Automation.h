@@ -15,7 +15,7 @@ namespace automation {
 
 // Any automation object; concrete objects derive from the interfaces they offer.
 class Object {
-public:
+  public:
     virtual ~Object() = default;
 };
 
@@ -25,13 +25,13 @@ std::shared_ptr<Interface> queryInterface(const std::shared_ptr<Object>& object)
 }
 
 class ScpiParser : public virtual Object {
-public:
+  public:
     // One command in, the whole reply out (empty for commands without a reply).
     virtual std::string parse(const std::string& command) = 0;
 };
 
 class MeasurementData : public virtual Object {
-public:
+  public:
     // Reads one trace. `points` holds the expected length on entry and the length the
     // analyzer delivered on return; at most destination.size() values are written.
     // Returns 0 on success, a nonzero failure status otherwise.
@@ -40,7 +40,7 @@ public:
 };
 
 class Measurement : public virtual Object {
-public:
+  public:
     virtual std::string name() = 0;
     // Receiver and source port, e.g. "R1,PORT 1".
     virtual std::string parameter() = 0;
@@ -50,7 +50,7 @@ public:
 };
 
 class MeasurementCollection : public virtual Object {
-public:
+  public:
     virtual int count() = 0;
     // index from 1 to count(); nullptr when out of range.
     virtual std::shared_ptr<Object> item(int index) = 0;
@@ -68,14 +68,14 @@ struct SegmentRow {
 };
 
 class SegmentTable : public virtual Object {
-public:
+  public:
     virtual void writeTable(const std::vector<SegmentRow>& rows) = 0;
     virtual void setPerSegmentBandwidth(int on) = 0;
     virtual void enablePerSegmentPower() = 0;
 };
 
 class Channel : public virtual Object {
-public:
+  public:
     // 0 linear, 2 power sweep, 3 CW, 4 segment sweep.
     virtual void setSweepType(int code) = 0;
     virtual double startFrequency() = 0;
@@ -98,7 +98,7 @@ public:
 };
 
 class Application : public virtual Object {
-public:
+  public:
     // nullptr when the application cannot hand out a parser.
     virtual std::shared_ptr<Object> scpiParser() = 0;
     // The argument-less operation that starts preparation and channel set-up.

@@ -15,7 +15,7 @@ namespace automation {
 using BackendCreator = std::function<std::shared_ptr<Object>(const std::string& host)>;
 
 class BackendFactory {
-public:
+  public:
     static void registerBackend(const std::string& name, BackendCreator creator);
     static void unregisterBackend(const std::string& name);
     // Which registered back end the empty host name means.
