@@ -77,14 +77,14 @@ int ConsoleRun::runWith(const std::string& script, bool yes, const std::string& 
     return status;
 }
 
-bool ConsoleRun::inOrder(const std::vector<std::string>& expected) const {
+bool inOrder(const std::string& text, const std::vector<std::string>& expected) {
     std::size_t at = 0;
-    for (const auto& text : expected) {
-        at = m_out.find(text, at);
+    for (const auto& part : expected) {
+        at = text.find(part, at);
         if (at == std::string::npos) {
             return false;
         }
-        at += text.size();
+        at += part.size();
     }
     return true;
 }

@@ -18,6 +18,9 @@
 
 namespace testsupport {
 
+// Whether the parts occur in text in this order, each after the end of the one before.
+bool inOrder(const std::string& text, const std::vector<std::string>& expected);
+
 class ConsoleRun {
   public:
     // scenario: JSON text of a simulator scenario.
@@ -37,7 +40,9 @@ class ConsoleRun {
     const std::string& out() const { return m_out; }
     const std::string& err() const { return m_err; }
     // The output lines in order, and whether `expected` occur among them in this order.
-    bool inOrder(const std::vector<std::string>& expected) const;
+    bool inOrder(const std::vector<std::string>& expected) const {
+        return testsupport::inOrder(m_out, expected);
+    }
     bool has(const std::string& text) const { return m_out.find(text) != std::string::npos; }
     std::vector<std::string> transcriptMatching(const std::string& text) const;
     sim::SimulatedAnalyzer& simulator() { return *m_simulator; }

@@ -8,6 +8,7 @@
 #include "ConsoleRun.h"
 
 using testsupport::ConsoleRun;
+using testsupport::inOrder;
 
 namespace {
 
@@ -103,18 +104,6 @@ struct Session {
         return screen.text();
     }
 };
-
-bool inOrder(const std::string& text, const std::vector<std::string>& expected) {
-    std::size_t at = 0;
-    for (const auto& part : expected) {
-        at = text.find(part, at);
-        if (at == std::string::npos) {
-            return false;
-        }
-        at += part.size();
-    }
-    return true;
-}
 
 }  // namespace
 
