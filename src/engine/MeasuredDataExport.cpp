@@ -71,16 +71,29 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     std::vector<char> block(flushAt + rowRoom);
     char* const begin = block.data();
     char* at = begin;
-    for (std::size_t j = 0; j < m_frequencies.size(); ++j) {
-        at = platform::writeGeneral(at, m_frequencies[j], 15);
-        for (const RowReadings& row : readings) {
-            *at++ = ',';
-            at = platform::writeFloat8(at, row.at(j));
+    // Readings are copied a tile of columns at a time, so that each row is read front to back
+    // rather than one value from every row per line.
+    constexpr std::size_t tileWidth = 64;
+    std::vector<float> tile(readings.size() * tileWidth);
+    for (std::size_t first = 0; first < m_frequencies.size(); first += tileWidth) {
+        const std::size_t width = std::min(tileWidth, m_frequencies.size() - first);
+        for (std::size_t r = 0; r < readings.size(); ++r) {
+            float* out = &tile[r * tileWidth];
+            for (std::size_t c = 0; c < width; ++c) {
+                out[c] = readings[r].at(first + c);
+            }
         }
-        *at++ = '\n';
-        if (static_cast<std::size_t>(at - begin) >= flushAt) {
-            std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
-            at = begin;
+        for (std::size_t c = 0; c < width; ++c) {
+            at = platform::writeGeneral(at, m_frequencies[first + c], 15);
+            for (std::size_t r = 0; r < readings.size(); ++r) {
+                *at++ = ',';
+                at = platform::writeFloat8(at, tile[r * tileWidth + c]);
+            }
+            *at++ = '\n';
+            if (static_cast<std::size_t>(at - begin) >= flushAt) {
+                std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
+                at = begin;
+            }
         }
     }
     std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());

@@ -135,6 +135,37 @@ TEST(MeasuredDataExport, WritesHeaderPrecisionsAndRepeatsShortRows) {
     EXPECT_NO_THROW(store.writeAllMeasuredData("A", dir / "missing" / "deeper"));
 }
 
+TEST(MeasuredDataExport, ManyFrequenciesKeepEveryReadingInItsColumn) {
+    platform::ScriptedOperatorUi ui;
+    CCompressionData store(ui);
+    store.setPowerLevels({-30});
+    std::vector<double> frequencies;
+    std::vector<float> test, ratio, phase;
+    for (int j = 0; j < 150; ++j) {
+        frequencies.push_back(1e6 * (j + 1));
+        test.push_back(static_cast<float>(j));
+        phase.push_back(static_cast<float>(-j));
+        if (j < 100) {
+            ratio.push_back(static_cast<float>(j) + 0.5f);
+        }
+    }
+    store.setFrequencies(std::move(frequencies), {});
+    store.putTrace("TestMag", test, 0);
+    store.putTrace("RatioMag", ratio, 0);
+    store.putTrace("Phase", phase, 0);
+
+    testsupport::TempDir dir;
+    store.writeAllMeasuredData("A", dir.path());
+    const auto rows = lines(testsupport::readFile(dir / "RcvrChar_AllMeasuredData_A.csv"));
+    ASSERT_EQ(rows.size(), 151u);
+    for (int j = 0; j < 150; ++j) {
+        const std::string expected = std::to_string(1000000 * (j + 1)) + "," + std::to_string(j) +
+                                     "," + std::to_string(std::min(j, 99)) + ".5," +
+                                     (j == 0 ? "0" : "-" + std::to_string(j));
+        EXPECT_EQ(rows[static_cast<std::size_t>(j) + 1], expected) << j;
+    }
+}
+
 TEST(WrapPhase, FoldsWholeTurnsAndTheOuterBand) {
     EXPECT_FLOAT_EQ(engine::wrapPhase(310), -50);
     EXPECT_FLOAT_EQ(engine::wrapPhase(-310), 50);
