@@ -1,4 +1,7 @@
+#include <algorithm>
 #include <cstdio>
+#include <deque>
+#include <future>
 #include <memory>
 #include <vector>
 
@@ -38,6 +41,54 @@ RowReadings rowOf(const CCompressionData::Table& table, std::size_t row) {
     return {table[row].data(), table[row].size()};
 }
 
+constexpr std::size_t kTileWidth = 64;
+constexpr std::size_t kChunkRoom = std::size_t{4} << 20;
+constexpr std::size_t kChunksInFlight = 2;
+
+// Bytes one line can take at the most.
+std::size_t lineRoom(const std::vector<RowReadings>& readings) {
+    return (readings.size() + 1) * (platform::kNumberRoom + 1) + 1;
+}
+
+struct LinesText {
+    std::vector<char> bytes;  // room for the worst case; only the first `size` are text
+    std::size_t size = 0;
+};
+
+// The lines of frequencies [first, end), written into bytes (reused from an earlier chunk
+// when it has room, so that its pages are not faulted in again). Readings are copied a tile of
+// columns at a time, so that each row is read front to back rather than one value from every row
+// per line.
+LinesText formatLines(const std::vector<double>& frequencies,
+                      const std::vector<RowReadings>& readings, std::size_t first, std::size_t end,
+                      std::vector<char> bytes) {
+    if (bytes.size() < (end - first) * lineRoom(readings)) {
+        bytes.resize((end - first) * lineRoom(readings));
+    }
+    LinesText text{std::move(bytes)};
+    char* at = text.bytes.data();
+    std::vector<float> tile(readings.size() * kTileWidth);
+    for (std::size_t tileStart = first; tileStart < end; tileStart += kTileWidth) {
+        const std::size_t width = std::min(kTileWidth, end - tileStart);
+        for (std::size_t r = 0; r < readings.size(); ++r) {
+            float* out = &tile[r * kTileWidth];
+            for (std::size_t c = 0; c < width; ++c) {
+                out[c] = readings[r].at(tileStart + c);
+            }
+        }
+        for (std::size_t c = 0; c < width; ++c) {
+            at = platform::writeGeneral(at, frequencies[tileStart + c], 15);
+            for (std::size_t r = 0; r < readings.size(); ++r) {
+                *at++ = ',';
+                at = platform::writeFloat8(at, tile[r * kTileWidth + c]);
+            }
+            *at++ = '\n';
+        }
+    }
+    text.size = static_cast<std::size_t>(at - text.bytes.data());
+    return text;
+}
+
 }  // namespace
 
 void CCompressionData::writeAllMeasuredData(const std::string& tag,
@@ -64,39 +115,37 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
         readings.push_back(rowOf(m_phase, i));
     }
 
-    // Rows are formatted straight into a block written out whenever it fills, so the memory
-    // stays bounded whatever the data size. A row never needs more than rowRoom bytes.
-    const std::size_t rowRoom = (readings.size() + 1) * (platform::kNumberRoom + 1) + 1;
-    constexpr std::size_t flushAt = 1 << 20;
-    std::vector<char> block(flushAt + rowRoom);
-    char* const begin = block.data();
-    char* at = begin;
-    // Readings are copied a tile of columns at a time, so that each row is read front to back
-    // rather than one value from every row per line.
-    constexpr std::size_t tileWidth = 64;
-    std::vector<float> tile(readings.size() * tileWidth);
-    for (std::size_t first = 0; first < m_frequencies.size(); first += tileWidth) {
-        const std::size_t width = std::min(tileWidth, m_frequencies.size() - first);
-        for (std::size_t r = 0; r < readings.size(); ++r) {
-            float* out = &tile[r * tileWidth];
-            for (std::size_t c = 0; c < width; ++c) {
-                out[c] = readings[r].at(first + c);
-            }
+    // Chunks of lines are formatted on other threads while the finished ones are written in
+    // order; a few chunks in flight keep the memory bounded whatever the data size.
+    const std::size_t n = m_frequencies.size();
+    const std::size_t chunkRows =
+        std::max(kTileWidth, kChunkRoom / lineRoom(readings) / kTileWidth * kTileWidth);
+    std::vector<std::vector<char>> spare;
+    std::deque<std::future<LinesText>> formatting;
+    const auto writeOldest = [&] {
+        LinesText text = formatting.front().get();
+        formatting.pop_front();
+        std::fwrite(text.bytes.data(), 1, text.size, file.get());
+        spare.push_back(std::move(text.bytes));
+    };
+    for (std::size_t first = 0; first < n; first += chunkRows) {
+        const std::size_t end = std::min(n, first + chunkRows);
+        std::vector<char> bytes;
+        if (!spare.empty()) {
+            bytes = std::move(spare.back());
+            spare.pop_back();
         }
-        for (std::size_t c = 0; c < width; ++c) {
-            at = platform::writeGeneral(at, m_frequencies[first + c], 15);
-            for (std::size_t r = 0; r < readings.size(); ++r) {
-                *at++ = ',';
-                at = platform::writeFloat8(at, tile[r * tileWidth + c]);
-            }
-            *at++ = '\n';
-            if (static_cast<std::size_t>(at - begin) >= flushAt) {
-                std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
-                at = begin;
-            }
+        formatting.push_back(std::async(
+            std::launch::async, [this, &readings, first, end, bytes = std::move(bytes)]() mutable {
+                return formatLines(m_frequencies, readings, first, end, std::move(bytes));
+            }));
+        if (formatting.size() > kChunksInFlight) {
+            writeOldest();
         }
     }
-    std::fwrite(begin, 1, static_cast<std::size_t>(at - begin), file.get());
+    while (!formatting.empty()) {
+        writeOldest();
+    }
 }
 
 }  // namespace engine
