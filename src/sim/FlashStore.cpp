@@ -5,7 +5,7 @@
 #include <cctype>
 #include <fstream>
 
-#include "sim/ScpiSyntax.h"
+#include "scpi/ProgramMessage.h"
 
 namespace sim {
 namespace {
@@ -19,7 +19,7 @@ std::string checkedName(const std::string& name, const char* what) {
         upper += static_cast<char>(std::toupper(u));
     }
     if (!ok) {
-        throw ScpiError{
+        throw scpi::Error{
             -224, std::string("Illegal parameter value; bad flash ") + what + " \"" + name + "\""};
     }
     return upper;

@@ -29,7 +29,7 @@ class FlashStore {
     explicit FlashStore(std::filesystem::path root);
 
     // Names are letters, digits, '_', '-' and '.', at most 64 characters; others raise
-    // ScpiError -224 naming the name.
+    // scpi::Error -224 naming the name.
     void write(const std::string& file, const std::string& name,
                std::span<const std::uint16_t> words, TimePoint when);
     std::optional<std::vector<std::uint16_t>> read(const std::string& file,

@@ -332,7 +332,7 @@ MeasurementState& Instrument::measurementNamed(const std::string& name) {
             return m;
         }
     }
-    throw ScpiError{-224, "Illegal parameter value; no measurement named \"" + name + "\""};
+    throw scpi::Error{-224, "Illegal parameter value; no measurement named \"" + name + "\""};
 }
 
 std::string Instrument::parsePortText(const std::string& text) const {
@@ -349,18 +349,19 @@ MeasurementState& Instrument::defineMeasurement(const std::string& name,
                                                 const std::string& parameter) {
     for (const auto& m : m_measurements) {
         if (m.name == name) {
-            throw ScpiError{-200, "Execution error; measurement \"" + name + "\" exists"};
+            throw scpi::Error{-200, "Execution error; measurement \"" + name + "\" exists"};
         }
     }
     if (name.empty()) {
-        throw ScpiError{-224, "Illegal parameter value; empty measurement name"};
+        throw scpi::Error{-224, "Illegal parameter value; empty measurement name"};
     }
     MeasurementState m;
     m.name = name;
     m.parameter = parameter;
     std::string what = platform::upperCased(parameter.substr(0, parameter.find(',')));
     auto bad = [&] {
-        return ScpiError{-224, "Illegal parameter value; unknown parameter \"" + parameter + "\""};
+        return scpi::Error{-224,
+                           "Illegal parameter value; unknown parameter \"" + parameter + "\""};
     };
     if (parameter.find(',') != std::string::npos) {
         std::string digits = parsePortText(parameter.substr(parameter.find(',') + 1));
@@ -403,7 +404,7 @@ void Instrument::deleteMeasurement(const std::string& name) {
     auto it = std::find_if(m_measurements.begin(), m_measurements.end(),
                            [&](const MeasurementState& m) { return m.name == name; });
     if (it == m_measurements.end()) {
-        throw ScpiError{-224, "Illegal parameter value; no measurement named \"" + name + "\""};
+        throw scpi::Error{-224, "Illegal parameter value; no measurement named \"" + name + "\""};
     }
     const int id = it->id;
     m_measurements.erase(it);

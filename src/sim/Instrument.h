@@ -19,10 +19,10 @@
 
 #include "analyzer/automation/Automation.h"
 #include "platform/Clock.h"
-#include "sim/ErrorQueue.h"
+#include "scpi/CommandTable.h"
+#include "scpi/ErrorQueue.h"
 #include "sim/FlashStore.h"
 #include "sim/Scenario.h"
-#include "sim/ScpiCommandTable.h"
 #include "sim/Transcript.h"
 
 namespace sim {
@@ -177,9 +177,9 @@ class Instrument {
     std::filesystem::path m_stateDirectory;
     std::shared_ptr<platform::Clock> m_clock;
     Transcript m_transcript;
-    ErrorQueue m_errors;
+    scpi::ErrorQueue m_errors;
     FlashStore m_flash;
-    ScpiCommandTable m_commands;
+    scpi::CommandTable m_commands;
     unsigned m_generation = 1;
     std::vector<int> m_errorRuleUses;
     std::mt19937 m_noise{20260412};

@@ -39,7 +39,7 @@ std::string inQuotes(const std::string& text) {
 
 int integerIn(double value, int low, int high) {
     if (!(value >= low && value <= high) || std::floor(value) != value) {
-        throw ScpiError{-222, "Data out of range"};
+        throw scpi::Error{-222, "Data out of range"};
     }
     return static_cast<int>(value);
 }
@@ -52,7 +52,7 @@ std::string Instrument::parse(unsigned generation, const std::string& command) {
     checkGeneration(generation, "SCPI parse");
     std::string reply;
     bool first = true;
-    for (std::string_view unit : splitMessageUnits(command)) {
+    for (std::string_view unit : scpi::splitMessageUnits(command)) {
         std::string part = executeUnit(unit);
         applyErrorRules(unit);
         if (!part.empty()) {
@@ -69,12 +69,12 @@ std::string Instrument::parse(unsigned generation, const std::string& command) {
 
 std::string Instrument::executeUnit(std::string_view unit) {
     try {
-        CommandHeader header = parseHeader(unit);
-        ParameterReader parameters(header.parameters);
+        scpi::CommandHeader header = scpi::parseHeader(unit);
+        scpi::ParameterReader parameters(header.parameters);
         std::string reply = m_commands.dispatch(header, parameters);
         parameters.finish();
         return reply;
-    } catch (const ScpiError& error) {
+    } catch (const scpi::Error& error) {
         m_errors.push(error.code, error.message);
         m_transcript.record('!', std::to_string(error.code) + ",\"" + error.message + "\"");
         return "";
@@ -96,7 +96,7 @@ void Instrument::applyErrorRules(std::string_view unit) {
 
 void Instrument::buildCommands() {
     auto& t = m_commands;
-    using C = CommandContext;
+    using C = scpi::CommandContext;
 
     // Identification and status.
     t.add("*IDN?", [this](C&) { return m_scenario.idn; });
@@ -128,7 +128,7 @@ void Instrument::buildCommands() {
         if (which == "CONFIGURATION" || which == "CONF") {
             return inQuotes("C:\\ProgramData\\Velquor\\Network Analyzer\\Configurations");
         }
-        throw ScpiError{-224, "Illegal parameter value; no directory " + which};
+        throw scpi::Error{-224, "Illegal parameter value; no directory " + which};
     });
     t.add("DIAGnostic:PORTCOUNT?", [this](C&) { return std::to_string(m_scenario.portCount); });
 
@@ -140,12 +140,12 @@ void Instrument::buildCommands() {
             std::string digits = parsePortText(text);
             if (digits.empty() || digits.size() > 2 ||
                 platform::upperCased(text).find("PORT") == std::string::npos) {
-                throw ScpiError{-224, "Illegal parameter value; no source port \"" + text + "\""};
+                throw scpi::Error{-224, "Illegal parameter value; no source port \"" + text + "\""};
             }
             port = std::stoi(digits);
         }
         if (port < 1 || port > m_scenario.portCount) {
-            throw ScpiError{-222, "Data out of range; port " + std::to_string(port)};
+            throw scpi::Error{-222, "Data out of range; port " + std::to_string(port)};
         }
         return port;
     };
@@ -153,7 +153,7 @@ void Instrument::buildCommands() {
         double power = c.parameters.number();
         int port = portOf(c);
         if (power < -90.0 || power > 20.0) {
-            throw ScpiError{-222, "Data out of range; source power -90 to 20 dBm"};
+            throw scpi::Error{-222, "Data out of range; source power -90 to 20 dBm"};
         }
         // Port powers are coupled, as after a preset: one level for every port.
         if (m_powerCoupled) {
@@ -208,7 +208,7 @@ void Instrument::buildCommands() {
     auto selected = [this]() -> MeasurementState& {
         MeasurementState* m = selectedMeasurement();
         if (!m) {
-            throw ScpiError{-221, "Settings conflict; no measurement selected"};
+            throw scpi::Error{-221, "Settings conflict; no measurement selected"};
         }
         return *m;
     };
@@ -221,7 +221,7 @@ void Instrument::buildCommands() {
     t.add("CALCulate#:FUNCtion:TYPE", [this](C& c) {
         std::string type = c.parameters.word();
         if (type != "MEAN" && type != "PTP" && type != "STDEV" && type != "MIN" && type != "MAX") {
-            throw ScpiError{-224, "Illegal parameter value; statistic " + type};
+            throw scpi::Error{-224, "Illegal parameter value; statistic " + type};
         }
         m_statisticsType = type;
         return std::string();
@@ -231,7 +231,7 @@ void Instrument::buildCommands() {
         long points = static_cast<long>(m.mag.size());
         std::vector<float> trace(m.mag.size());
         if (readTrace(m.id, 2, 1, points, trace) != 0 || points == 0) {
-            throw ScpiError{-230, "Data corrupt or stale; no trace data"};
+            throw scpi::Error{-230, "Data corrupt or stale; no trace data"};
         }
         trace.resize(static_cast<std::size_t>(points));
         double sum = std::accumulate(trace.begin(), trace.end(), 0.0);
@@ -254,7 +254,7 @@ void Instrument::buildCommands() {
     t.add("CALCulate#:MATH:MEMorize", [selected](C&) {
         MeasurementState& m = selected();
         if (!m.hasData) {
-            throw ScpiError{-200, "Execution error; no data to memorize"};
+            throw scpi::Error{-200, "Execution error; no data to memorize"};
         }
         m.memMag = m.mag;
         m.memPhase = m.phase;
@@ -265,13 +265,13 @@ void Instrument::buildCommands() {
         MeasurementState& m = selected();
         if (function == "DIV" || function == "DIVIDE") {
             if (m.memMag.empty()) {
-                throw ScpiError{-221, "Settings conflict; no memory trace"};
+                throw scpi::Error{-221, "Settings conflict; no memory trace"};
             }
             m.divide = true;
         } else if (function == "NORM" || function == "NORMAL") {
             m.divide = false;
         } else {
-            throw ScpiError{-224, "Illegal parameter value; math function " + function};
+            throw scpi::Error{-224, "Illegal parameter value; math function " + function};
         }
         return std::string();
     });
@@ -288,8 +288,8 @@ void Instrument::buildCommands() {
     t.add("DISPlay:WINDow#:TRACe#:SELect", [this](C& c) {
         auto feed = m_traceFeeds.find({c.suffix(0), c.suffix(1)});
         if (feed == m_traceFeeds.end()) {
-            throw ScpiError{-221, "Settings conflict; trace " + std::to_string(c.suffix(1)) +
-                                      " shows no measurement"};
+            throw scpi::Error{-221, "Settings conflict; trace " + std::to_string(c.suffix(1)) +
+                                        " shows no measurement"};
         }
         m_selectedId = measurementNamed(feed->second).id;
         return std::string();
@@ -301,7 +301,7 @@ void Instrument::buildCommands() {
     t.add("DISPlay:WINDow#:TRACe#:Y:[SCALe]:PDIVision", [this](C& c) {
         double scale = c.parameters.number();
         if (scale <= 0.0) {
-            throw ScpiError{-222, "Data out of range; scale per division"};
+            throw scpi::Error{-222, "Data out of range; scale per division"};
         }
         m_traceScale[{c.suffix(0), c.suffix(1)}] = scale;
         return std::string();
@@ -345,7 +345,7 @@ void Instrument::buildCommands() {
     t.add("FORMat:[DATA]", [this](C& c) {
         std::string format = c.parameters.word();
         if (format != "ASC" && format != "ASCII" && format != "REAL") {
-            throw ScpiError{-224, "Illegal parameter value; data format " + format};
+            throw scpi::Error{-224, "Illegal parameter value; data format " + format};
         }
         if (!c.parameters.atEnd()) {
             c.parameters.number();
@@ -361,10 +361,10 @@ void Instrument::buildCommands() {
         std::string element = platform::upperCased(c.parameters.string());
         std::string value = platform::upperCased(c.parameters.string());
         if (element.empty() || value.empty()) {
-            throw ScpiError{-224, "Illegal parameter value; empty path element"};
+            throw scpi::Error{-224, "Illegal parameter value; empty path element"};
         }
         if (element == "IFSIGPATHALL" && value != "NBF" && value != "WBF") {
-            throw ScpiError{-224, "Illegal parameter value; IF path " + value};
+            throw scpi::Error{-224, "Illegal parameter value; IF path " + value};
         }
         m_pathElements[element] = value;
         return std::string();
@@ -378,7 +378,7 @@ void Instrument::buildCommands() {
         }
         auto it = m_pathElements.find(element);
         if (it == m_pathElements.end()) {
-            throw ScpiError{-224, "Illegal parameter value; no path element \"" + element + "\""};
+            throw scpi::Error{-224, "Illegal parameter value; no path element \"" + element + "\""};
         }
         return inQuotes(it->second);
     });
@@ -397,7 +397,7 @@ void Instrument::buildCommands() {
         c.parameters.string();
         std::string value = platform::upperCased(c.parameters.string());
         if (value != "TRUE" && value != "FALSE") {
-            throw ScpiError{-224, "Illegal parameter value; \"" + value + "\""};
+            throw scpi::Error{-224, "Illegal parameter value; \"" + value + "\""};
         }
         return std::string();
     });
@@ -431,7 +431,7 @@ void Instrument::buildCommands() {
         std::string name = c.parameters.string();
         auto words = m_flash.read(file, name);
         if (!words) {
-            throw ScpiError{-256, "File name not found; " + file + "\\" + name};
+            throw scpi::Error{-256, "File name not found; " + file + "\\" + name};
         }
         std::string reply;
         reply.reserve(words->size() * 6 + 1);
@@ -460,7 +460,7 @@ void Instrument::buildCommands() {
         std::string file = c.parameters.string();
         std::string name = c.parameters.string();
         if (!m_flash.erase(file, name)) {
-            throw ScpiError{-256, "File name not found; " + file + "\\" + name};
+            throw scpi::Error{-256, "File name not found; " + file + "\\" + name};
         }
         return std::string();
     });

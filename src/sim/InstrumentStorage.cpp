@@ -48,7 +48,7 @@ void Instrument::pushPortData(int port) {
     }
     auto folder = portDataFolder(port);
     if (!std::filesystem::is_directory(folder)) {
-        throw ScpiError{-256, "File name not found; " + folder.string()};
+        throw scpi::Error{-256, "File name not found; " + folder.string()};
     }
     const std::pair<const char*, std::string> files[] = {
         {"RcvrCharRef.dat", "R" + std::to_string(port)},
@@ -61,7 +61,7 @@ void Instrument::pushPortData(int port) {
             continue;
         }
         if (std::filesystem::file_size(path) % 2 != 0) {
-            throw ScpiError{-200, std::string("Execution error; odd length of ") + file};
+            throw scpi::Error{-200, std::string("Execution error; odd length of ") + file};
         }
         m_flash.write("RCVRCHAR", receiver, *readWordFile(path), std::chrono::system_clock::now());
     }

@@ -11,9 +11,9 @@
 #include <string_view>
 #include <vector>
 
-#include "sim/ScpiSyntax.h"
+#include "scpi/ProgramMessage.h"
 
-namespace sim {
+namespace scpi {
 
 struct CommandContext {
     ParameterReader& parameters;
@@ -25,10 +25,10 @@ struct CommandContext {
 // Returns the reply (empty for commands).
 using CommandHandler = std::function<std::string(CommandContext&)>;
 
-class ScpiCommandTable {
+class CommandTable {
   public:
     void add(std::string_view pattern, CommandHandler handler);
-    // Runs the matching entry; throws ScpiError -113 when no pattern matches.
+    // Runs the matching entry; throws Error -113 when no pattern matches.
     std::string dispatch(const CommandHeader& header, ParameterReader& parameters) const;
 
   private:
@@ -50,4 +50,4 @@ class ScpiCommandTable {
     std::vector<Entry> m_entries;
 };
 
-}  // namespace sim
+}  // namespace scpi

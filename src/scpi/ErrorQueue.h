@@ -7,7 +7,7 @@
 #include <deque>
 #include <string>
 
-namespace sim {
+namespace scpi {
 
 class ErrorQueue {
   public:
@@ -25,4 +25,4 @@ class ErrorQueue {
     std::deque<std::string> m_entries;
 };
 
-}  // namespace sim
+}  // namespace scpi

@@ -1,12 +1,11 @@
-#include "sim/ScpiCommandTable.h"
-#include "platform/UpperCase.h"
+#include "scpi/CommandTable.h"
 
 #include <cctype>
 
-namespace sim {
+namespace scpi {
 namespace {}  // namespace
 
-void ScpiCommandTable::add(std::string_view pattern, CommandHandler handler) {
+void CommandTable::add(std::string_view pattern, CommandHandler handler) {
     Entry entry;
     if (!pattern.empty() && pattern.back() == '?') {
         entry.query = true;
@@ -31,7 +30,7 @@ void ScpiCommandTable::add(std::string_view pattern, CommandHandler handler) {
                 node.shortForm += c;
             }
         }
-        node.longForm = platform::upperCased(std::string(text));
+        node.longForm = upperCased(text);
         entry.nodes.push_back(node);
         if (colon == std::string_view::npos) {
             break;
@@ -42,16 +41,16 @@ void ScpiCommandTable::add(std::string_view pattern, CommandHandler handler) {
     m_entries.push_back(std::move(entry));
 }
 
-bool ScpiCommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
-                                  const std::vector<std::string_view>& input, std::size_t i,
-                                  std::vector<int>& suffixes) {
+bool CommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
+                              const std::vector<std::string_view>& input, std::size_t i,
+                              std::vector<int>& suffixes) {
     if (p == pattern.size()) {
         return i == input.size();
     }
     const Node& node = pattern[p];
     std::size_t mark = suffixes.size();
     if (i < input.size()) {
-        std::string keyword = platform::upperCased(std::string(input[i]));
+        std::string keyword = upperCased(input[i]);
         int suffix = 1;
         if (node.numbered) {
             std::size_t digits = keyword.size();
@@ -85,8 +84,7 @@ bool ScpiCommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t 
     return false;
 }
 
-std::string ScpiCommandTable::dispatch(const CommandHeader& header,
-                                       ParameterReader& parameters) const {
+std::string CommandTable::dispatch(const CommandHeader& header, ParameterReader& parameters) const {
     for (const auto& entry : m_entries) {
         if (entry.query != header.query) {
             continue;
@@ -97,7 +95,7 @@ std::string ScpiCommandTable::dispatch(const CommandHeader& header,
             return entry.handler(context);
         }
     }
-    throw ScpiError{-113, "Undefined header"};
+    throw Error{-113, "Undefined header"};
 }
 
-}  // namespace sim
+}  // namespace scpi

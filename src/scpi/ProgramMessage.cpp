@@ -1,11 +1,10 @@
-#include "sim/ScpiSyntax.h"
-#include "platform/UpperCase.h"
+#include "scpi/ProgramMessage.h"
 
 #include <cctype>
 #include <charconv>
 #include <cmath>
 
-namespace sim {
+namespace scpi {
 namespace {
 
 bool isBlank(char c) {
@@ -25,6 +24,14 @@ constexpr Suffix suffixes[] = {
 };
 
 }  // namespace
+
+std::string upperCased(std::string_view text) {
+    std::string upper(text);
+    for (char& c : upper) {
+        c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+    }
+    return upper;
+}
 
 std::vector<std::string_view> splitMessageUnits(std::string_view message) {
     std::vector<std::string_view> units;
@@ -75,7 +82,7 @@ CommandHeader parseHeader(std::string_view unit) {
         text.remove_prefix(1);
     }
     if (text.empty()) {
-        throw ScpiError{-102, "Syntax error"};
+        throw Error{-102, "Syntax error"};
     }
     std::size_t start = 0;
     for (;;) {
@@ -83,11 +90,11 @@ CommandHeader parseHeader(std::string_view unit) {
         std::string_view node = text.substr(
             start, colon == std::string_view::npos ? std::string_view::npos : colon - start);
         if (node.empty()) {
-            throw ScpiError{-102, "Syntax error"};
+            throw Error{-102, "Syntax error"};
         }
         for (char c : node) {
             if (!std::isalnum(static_cast<unsigned char>(c)) && c != '_' && c != '*') {
-                throw ScpiError{-102, "Syntax error"};
+                throw Error{-102, "Syntax error"};
             }
         }
         header.nodes.push_back(node);
@@ -113,7 +120,7 @@ bool ParameterReader::atEnd() {
 void ParameterReader::expectParameter() {
     skipBlanks();
     if (m_pos >= m_text.size() || m_text[m_pos] == ',') {
-        throw ScpiError{-109, "Missing parameter"};
+        throw Error{-109, "Missing parameter"};
     }
 }
 
@@ -124,7 +131,7 @@ void ParameterReader::endParameter() {
         return;
     }
     if (m_text[m_pos] != ',') {
-        throw ScpiError{-103, "Invalid separator"};
+        throw Error{-103, "Invalid separator"};
     }
     ++m_pos;
     m_needParameter = true;
@@ -149,13 +156,13 @@ std::string ParameterReader::string() {
     expectParameter();
     char quote = m_text[m_pos];
     if (quote != '"' && quote != '\'') {
-        throw ScpiError{-104, "Data type error; string expected"};
+        throw Error{-104, "Data type error; string expected"};
     }
     std::string value;
     ++m_pos;
     for (;;) {
         if (m_pos >= m_text.size()) {
-            throw ScpiError{-151, "Invalid string data; missing closing quote"};
+            throw Error{-151, "Invalid string data; missing closing quote"};
         }
         char c = m_text[m_pos++];
         if (c == quote) {
@@ -180,31 +187,30 @@ double ParameterReader::number() {
     double value = 0.0;
     auto [end, ec] = std::from_chars(token.data(), token.data() + token.size(), value);
     if (ec != std::errc() || end == token.data()) {
-        throw ScpiError{-104,
-                        "Data type error; number expected, got \"" + std::string(token) + "\""};
+        throw Error{-104, "Data type error; number expected, got \"" + std::string(token) + "\""};
     }
     std::string_view rest(end, token.data() + token.size() - end);
     while (!rest.empty() && isBlank(rest.front())) {
         rest.remove_prefix(1);
     }
     if (!rest.empty()) {
-        std::string unit = platform::upperCased(std::string(rest));
+        std::string unit = upperCased(rest);
         for (const auto& suffix : suffixes) {
             if (unit == suffix.text) {
                 return value * suffix.factor;
             }
         }
-        throw ScpiError{-131, "Invalid suffix \"" + std::string(rest) + "\""};
+        throw Error{-131, "Invalid suffix \"" + std::string(rest) + "\""};
     }
     if (!std::isfinite(value)) {
-        throw ScpiError{-222, "Data out of range"};
+        throw Error{-222, "Data out of range"};
     }
     return value;
 }
 
 bool ParameterReader::boolean() {
     std::string_view token = rawToken();
-    std::string text = platform::upperCased(std::string(token));
+    std::string text = upperCased(token);
     if (text == "ON" || text == "TRUE") {
         return true;
     }
@@ -214,8 +220,8 @@ bool ParameterReader::boolean() {
     double value = 0.0;
     auto [end, ec] = std::from_chars(token.data(), token.data() + token.size(), value);
     if (ec != std::errc() || end != token.data() + token.size()) {
-        throw ScpiError{-224, "Illegal parameter value; ON or OFF expected, got \"" +
-                                  std::string(token) + "\""};
+        throw Error{-224, "Illegal parameter value; ON or OFF expected, got \"" +
+                              std::string(token) + "\""};
     }
     return std::lround(value) != 0;
 }
@@ -223,9 +229,9 @@ bool ParameterReader::boolean() {
 std::string ParameterReader::word() {
     std::string_view token = rawToken();
     if (token.front() == '"' || token.front() == '\'') {
-        throw ScpiError{-104, "Data type error; character data expected"};
+        throw Error{-104, "Data type error; character data expected"};
     }
-    return platform::upperCased(std::string(token));
+    return upperCased(token);
 }
 
 bool ParameterReader::nextWord(std::uint16_t& word) {
@@ -241,12 +247,12 @@ bool ParameterReader::nextWord(std::uint16_t& word) {
     unsigned long value = 0;
     auto [end, ec] = std::from_chars(first, last, value);
     if (ec == std::errc::result_out_of_range || (ec == std::errc() && value > 0xFFFF)) {
-        throw ScpiError{-222, "Data out of range; flash words are 0 to 65535"};
+        throw Error{-222, "Data out of range; flash words are 0 to 65535"};
     }
     m_pos = static_cast<std::size_t>(end - m_text.data());
     skipBlanks();
     if (ec != std::errc() || (m_pos < m_text.size() && m_text[m_pos] != ',')) {
-        throw ScpiError{-104, "Data type error; unsigned number expected"};
+        throw Error{-104, "Data type error; unsigned number expected"};
     }
     word = static_cast<std::uint16_t>(value);
     endParameter();
@@ -255,8 +261,8 @@ bool ParameterReader::nextWord(std::uint16_t& word) {
 
 void ParameterReader::finish() {
     if (!atEnd()) {
-        throw ScpiError{-108, "Parameter not allowed"};
+        throw Error{-108, "Parameter not allowed"};
     }
 }
 
-}  // namespace sim
+}  // namespace scpi

@@ -1,6 +1,6 @@
-#include "sim/ErrorQueue.h"
+#include "scpi/ErrorQueue.h"
 
-namespace sim {
+namespace scpi {
 
 void ErrorQueue::push(int code, const std::string& message) {
     pushText(std::to_string(code) + ",\"" + message + "\"");
@@ -23,4 +23,4 @@ std::string ErrorQueue::pop() {
     return entry;
 }
 
-}  // namespace sim
+}  // namespace scpi

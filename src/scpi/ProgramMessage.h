@@ -9,10 +9,13 @@
 #include <string_view>
 #include <vector>
 
-namespace sim {
+namespace scpi {
 
 // An instrument-side error: queued as code,"message"; never leaves the parser.
-struct ScpiError {
+// Keywords and words compare as the "C" locale upper-cases them.
+std::string upperCased(std::string_view text);
+
+struct Error {
     int code;
     std::string message;
 };
@@ -26,7 +29,7 @@ struct CommandHeader {
     std::string_view parameters;  // everything after the header's white space
 };
 
-// Throws ScpiError -102 for an empty or malformed header.
+// Throws Error -102 for an empty or malformed header.
 CommandHeader parseHeader(std::string_view unit);
 
 class ParameterReader {
@@ -58,4 +61,4 @@ class ParameterReader {
     bool m_needParameter = false;
 };
 
-}  // namespace sim
+}  // namespace scpi
