@@ -1,5 +1,6 @@
 #include "scpi/ProgramMessage.h"
 
+#include <algorithm>
 #include <cctype>
 #include <charconv>
 #include <cmath>
@@ -195,12 +196,12 @@ double ParameterReader::number() {
     }
     if (!rest.empty()) {
         std::string unit = upperCased(rest);
-        for (const auto& suffix : suffixes) {
-            if (unit == suffix.text) {
-                return value * suffix.factor;
-            }
+        auto suffix = std::find_if(std::begin(suffixes), std::end(suffixes),
+                                   [&](const Suffix& s) { return unit == s.text; });
+        if (suffix == std::end(suffixes)) {
+            throw Error{-131, "Invalid suffix \"" + std::string(rest) + "\""};
         }
-        throw Error{-131, "Invalid suffix \"" + std::string(rest) + "\""};
+        value *= suffix->factor;
     }
     if (!std::isfinite(value)) {
         throw Error{-222, "Data out of range"};

@@ -11,10 +11,10 @@
 
 namespace scpi {
 
-// An instrument-side error: queued as code,"message"; never leaves the parser.
 // Keywords and words compare as the "C" locale upper-cases them.
 std::string upperCased(std::string_view text);
 
+// An instrument-side error: queued as code,"message"; never leaves the parser.
 struct Error {
     int code;
     std::string message;
