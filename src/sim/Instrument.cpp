@@ -147,7 +147,8 @@ double Instrument::narrowbandOffsetDb(const std::string& receiver) const {
     return fault == m_scenario.faults.narrowbandLossDb.end() ? -3.0 : fault->second;
 }
 
-void Instrument::synthesize(const MeasurementState& m, double sourceDbm, float& mag, float& phase) {
+void Instrument::synthesize(const MeasurementState& m, double sourceDbm, double frequencyHz,
+                            float& mag, float& phase) {
     double magDb = 0.0;
     double phaseDeg = 0.0;
     double noiseDb = 0.0;
@@ -160,7 +161,7 @@ void Instrument::synthesize(const MeasurementState& m, double sourceDbm, float& 
             magDb = m.denominator.empty() ? noiseFloorDbm : noiseFloorDbm - sourceDbm;
         } else {
             double input = sourceDbm - connection->lossDb;
-            double compression = compressionDb(physics, input);
+            double compression = compressionDb(physics, input, frequencyHz);
             phaseDeg = physics.amPmDegPerDb * compression;
             magDb = m.denominator.empty() ? input + compression + narrowbandOffsetDb(receiver)
                                           : connection->lossDb + compression;
@@ -216,7 +217,35 @@ std::vector<double> Instrument::pointPowers(int sourcePort) const {
     return powers;
 }
 
+std::vector<double> Instrument::pointFrequencies() const {
+    std::vector<double> frequencies;
+    frequencies.reserve(static_cast<std::size_t>(sweepPoints()));
+    auto spread = [&frequencies](double start, double stop, long n) {
+        for (long i = 0; i < n; ++i) {
+            double fraction = n > 1 ? static_cast<double>(i) / static_cast<double>(n - 1) : 0;
+            frequencies.push_back(start + fraction * (stop - start));
+        }
+    };
+    switch (m_channel.sweepType) {
+        case 2:
+        case 3:
+            frequencies.assign(static_cast<std::size_t>(m_channel.points), m_channel.cwHz);
+            break;
+        case 4:
+            for (const auto& row : m_channel.segments) {
+                if (row.on != 0) {
+                    spread(row.start, row.stop, static_cast<long>(row.points));
+                }
+            }
+            break;
+        default:
+            spread(m_channel.startHz, m_channel.stopHz, m_channel.points);
+    }
+    return frequencies;
+}
+
 void Instrument::sweep() {
+    const std::vector<double> frequencies = pointFrequencies();
     for (auto& m : m_measurements) {
         const std::vector<double> powers = pointPowers(m.sourcePort);
         const std::size_t n = powers.size();
@@ -237,7 +266,7 @@ void Instrument::sweep() {
                 mag = m.memMag[i] + static_cast<float>(looseConnectorDb);
                 phase = m.memPhase[i];
             } else {
-                synthesize(m, powers[i], mag, phase);
+                synthesize(m, powers[i], frequencies[i], mag, phase);
             }
             if (m.averaged == 0) {
                 m.mag[i] = mag;
