@@ -150,7 +150,8 @@ double Instrument::narrowbandOffsetDb(const std::string& receiver) const {
     return fault == m_scenario.faults.narrowbandLossDb.end() ? -3.0 : fault->second;
 }
 
-void Instrument::synthesize(const MeasurementState& m, double sourceDbm, float& mag, float& phase) {
+void Instrument::synthesize(const MeasurementState& m, double sourceDbm, double frequencyHz,
+                            float& mag, float& phase) {
     double magDb = 0.0;
     double phaseDeg = 0.0;
     double noiseDb = 0.0;
@@ -163,7 +164,7 @@ void Instrument::synthesize(const MeasurementState& m, double sourceDbm, float& 
             magDb = m.denominator.empty() ? noiseFloorDbm : noiseFloorDbm - sourceDbm;
         } else {
             double input = sourceDbm - connection->lossDb;
-            double compression = compressionDb(physics, input);
+            double compression = compressionDb(physics, input, frequencyHz);
             phaseDeg = physics.amPmDegPerDb * compression;
             magDb = m.denominator.empty() ? input + compression + narrowbandOffsetDb(receiver)
                                           : connection->lossDb + compression;
@@ -271,6 +272,7 @@ void Instrument::waitForSweep(std::chrono::milliseconds limit) {
 }
 
 void Instrument::sweep() {
+    const std::vector<double> frequencies = pointFrequencies();
     for (auto& m : m_measurements) {
         const std::vector<double> powers = pointPowers(m.sourcePort);
         const std::size_t n = powers.size();
@@ -291,7 +293,7 @@ void Instrument::sweep() {
                 mag = m.memMag[i] + static_cast<float>(looseConnectorDb);
                 phase = m.memPhase[i];
             } else {
-                synthesize(m, powers[i], mag, phase);
+                synthesize(m, powers[i], frequencies[i], mag, phase);
             }
             if (m.averaged == 0) {
                 m.mag[i] = mag;

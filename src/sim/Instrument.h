@@ -256,7 +256,8 @@ class Instrument {
     // Readings.
     std::optional<Connection> reach(const std::string& receiver, int sourcePort) const;
     std::string characterizedReceiver(const MeasurementState& m) const;
-    void synthesize(const MeasurementState& m, double sourceDbm, float& mag, float& phase);
+    void synthesize(const MeasurementState& m, double sourceDbm, double frequencyHz, float& mag,
+                    float& phase);
     double narrowbandOffsetDb(const std::string& receiver) const;
     double sourcePowerDbm(int port) const;
     std::vector<double> pointPowers(int sourcePort) const;

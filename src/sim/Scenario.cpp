@@ -81,9 +81,29 @@ void checkReceiver(const Scenario& scenario, const std::string& name, const std:
 
 void readReceiverOverrides(const json& value, const std::string& key, ReceiverParameters& p) {
     expectObject(value, key);
-    rejectUnknownKeys(value, {"psat_dbm", "smoothness", "am_pm_deg_per_db", "noise_db"}, key);
+    rejectUnknownKeys(value,
+                      {"psat_dbm", "psat_slope_db_per_ghz", "psat_ripple_db",
+                       "psat_ripple_period_ghz", "smoothness", "am_pm_deg_per_db", "noise_db"},
+                      key);
     if (value.contains("psat_dbm")) {
         p.psatDbm = readNumber(value["psat_dbm"], key + ".psat_dbm");
+    }
+    if (value.contains("psat_slope_db_per_ghz")) {
+        p.psatSlopeDbPerGhz =
+            readNumber(value["psat_slope_db_per_ghz"], key + ".psat_slope_db_per_ghz");
+    }
+    if (value.contains("psat_ripple_db")) {
+        p.psatRippleDb = readNumber(value["psat_ripple_db"], key + ".psat_ripple_db");
+    }
+    if (value.contains("psat_ripple_period_ghz")) {
+        p.psatRipplePeriodGhz =
+            readNumber(value["psat_ripple_period_ghz"], key + ".psat_ripple_period_ghz");
+    }
+    // Checked on the merged values: "*" may set the ripple and a receiver the period.
+    if ((value.contains("psat_ripple_db") || value.contains("psat_ripple_period_ghz")) &&
+        p.psatRippleDb != 0.0 && p.psatRipplePeriodGhz <= 0.0) {
+        fail("\"" + key +
+             ".psat_ripple_period_ghz\" must be greater than 0 while \"psat_ripple_db\" is not 0");
     }
     if (value.contains("smoothness")) {
         p.smoothness = readNumber(value["smoothness"], key + ".smoothness");

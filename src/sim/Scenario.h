@@ -14,7 +14,11 @@ namespace sim {
 
 // Rapp AM/AM compression and AM/PM of one receiver (docs/simulator.md).
 struct ReceiverParameters {
+    // Psat at 0 Hz; it moves with frequency by the slope and the ripple.
     double psatDbm = 0.0;
+    double psatSlopeDbPerGhz = 0.0;
+    double psatRippleDb = 0.0;
+    double psatRipplePeriodGhz = 5.0;
     double smoothness = 1.0;
     double amPmDegPerDb = 3.0;
     // Standard deviation of the Gaussian reading noise, dB.

@@ -51,7 +51,7 @@ std::vector<std::uint16_t> makeStoredImage(const std::string& receiver,
                                : start;
         appendValue(image, f);
         for (double x : compressionLevels) {
-            double input = compressionInputPowerDbm(physics, x);
+            double input = compressionInputPowerDbm(physics, x, f);
             appendValue(image, static_cast<float>(input - x));
             appendValue(image, static_cast<float>(-x));
             appendValue(image, static_cast<float>(-physics.amPmDegPerDb * x));

@@ -2,7 +2,7 @@
 
 // Characterizations that a scenario puts into the instrument before the first run: images
 // in the stored format (11-word header, 28-word records, little-endian words) whose
-// compression points are the receiver's closed-form truth.
+// compression points are the receiver's closed-form truth at each record's frequency.
 
 #include <cstdint>
 #include <string>

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <ctime>
@@ -86,7 +87,8 @@ TEST_F(Flash, CatalogListsDateFirstAndTheNameFourth) {
 }
 
 TEST_F(Flash, StoredImagesHoldTheClosedFormTruth) {
-    start(R"({"stored": [{"receiver": "R1", "age_days": 0, "records": 3}]})");
+    start(R"({"receivers": {"R1": {"psat_slope_db_per_ghz": -0.2, "psat_ripple_db": 0.5}},
+              "stored": [{"receiver": "R1", "age_days": 0, "records": 3}]})");
     std::string reply = scpi("DIAG:flasharray? \"RCVRCHAR\",\"R1\"");
     std::vector<std::uint16_t> words;
     for (std::size_t pos = 1; pos < reply.size();) {
@@ -108,10 +110,34 @@ TEST_F(Flash, StoredImagesHoldTheClosedFormTruth) {
         return f;
     };
     EXPECT_FLOAT_EQ(30.0f, floatAt(9));
-    // First record, level 0.05 dB: reading = input power at compression minus 0.05.
+    auto doubleAt = [&](std::size_t i) {
+        std::uint64_t bits = 0;
+        for (std::size_t w = 0; w < 4; ++w) {
+            bits |= static_cast<std::uint64_t>(words[i + w]) << (16 * w);
+        }
+        double d;
+        std::memcpy(&d, &bits, 8);
+        return d;
+    };
+    // Records from 10 MHz to 26.5 GHz; at each level the reading is the input power at
+    // compression, at the record's own frequency, minus the level.
     const auto& r1 = m_analyzer->scenario().receiver("R1");
-    EXPECT_NEAR(sim::compressionInputPowerDbm(r1, 0.05) - 0.05, floatAt(15), 1e-4);
-    EXPECT_FLOAT_EQ(-0.05f, floatAt(17));
+    const double frequencies[] = {10e6, (10e6 + 26.5e9) / 2, 26.5e9};
+    const double levels[] = {0.05, 0.1, 0.2, 0.5};
+    for (std::size_t r = 0; r < 3; ++r) {
+        const std::size_t at = 11 + 28 * r;
+        EXPECT_DOUBLE_EQ(frequencies[r], doubleAt(at)) << "record " << r;
+        for (std::size_t k = 0; k < 4; ++k) {
+            const double x = levels[k];
+            EXPECT_NEAR(sim::compressionInputPowerDbm(r1, x, frequencies[r]) - x,
+                        floatAt(at + 4 + 6 * k), 1e-4)
+                << "record " << r << ", level " << x;
+            EXPECT_FLOAT_EQ(static_cast<float>(-x), floatAt(at + 6 + 6 * k));
+            EXPECT_FLOAT_EQ(static_cast<float>(-r1.amPmDegPerDb * x), floatAt(at + 8 + 6 * k));
+        }
+    }
+    // The scenario's slope shows: the last record reads about 5 dB below the first.
+    EXPECT_LT(floatAt(11 + 56 + 4), floatAt(11 + 4) - 4.0f);
 }
 
 TEST_F(Flash, FlashSurvivesRestartAndTheNextRunButVolatileStateDoesNot) {

@@ -10,17 +10,40 @@ namespace {
 
 using simtest::SimFixture;
 
-TEST(ReceiverPhysics, ClosedFormInvertsTheCompressionCurve) {
+TEST(ReceiverPhysics, PsatFollowsSlopeAndRippleAndTheClosedFormInvertsAtEveryFrequency) {
+    sim::ReceiverParameters flat{.psatDbm = -7.0};
+    sim::ReceiverParameters tilted{.psatDbm = -7.0,
+                                   .psatSlopeDbPerGhz = -0.4,
+                                   .psatRippleDb = 1.5,
+                                   .psatRipplePeriodGhz = 4.0};
+    // A quarter period is the ripple's crest, three quarters its trough, a half its zero.
+    EXPECT_NEAR(-7.0, sim::psatDbm(tilted, 0.0), 1e-12);
+    EXPECT_NEAR(-7.0 - 0.4 + 1.5, sim::psatDbm(tilted, 1e9), 1e-12);
+    EXPECT_NEAR(-7.0 - 0.8, sim::psatDbm(tilted, 2e9), 1e-12);
+    EXPECT_NEAR(-7.0 - 1.2 - 1.5, sim::psatDbm(tilted, 3e9), 1e-12);
+    // 26.5 GHz is 6 5/8 periods: the ripple reads sin(225 degrees).
+    EXPECT_NEAR(-7.0 - 10.6 - 1.5 * std::sqrt(0.5), sim::psatDbm(tilted, 26.5e9), 1e-12);
+    // Without a ripple the period does not matter, even 0.
+    sim::ReceiverParameters noPeriod{
+        .psatDbm = -7.0, .psatSlopeDbPerGhz = 0.1, .psatRipplePeriodGhz = 0.0};
+    EXPECT_NEAR(-7.0 + 1.3, sim::psatDbm(noPeriod, 13e9), 1e-12);
+    EXPECT_DOUBLE_EQ(-7.0, sim::psatDbm(flat, 40e9));
+
     for (double s : {0.5, 1.0, 2.0, 4.0}) {
-        sim::ReceiverParameters r{-7.0, s, 3.0, 0.0};
-        for (double x : {0.05, 0.1, 0.2, 0.5, 1.0}) {
-            double p = sim::compressionInputPowerDbm(r, x);
-            EXPECT_NEAR(-x, sim::compressionDb(r, p), 1e-9) << "s=" << s << " x=" << x;
+        tilted.smoothness = s;
+        for (double f : {10e6, 1e9, 3e9, 7.7e9, 26.5e9, 110e9}) {
+            const double psat = sim::psatDbm(tilted, f);
+            for (double x : {0.05, 0.1, 0.2, 0.5, 1.0}) {
+                double p = sim::compressionInputPowerDbm(tilted, x, f);
+                EXPECT_NEAR(-x, sim::compressionDb(tilted, p, f), 1e-9)
+                    << "s=" << s << " x=" << x << " f=" << f;
+            }
+            // At saturation the compression is (10/s) log10(2), and far below it nothing.
+            EXPECT_NEAR(-10.0 / s * std::log10(2.0), sim::compressionDb(tilted, psat, f), 1e-12);
+            EXPECT_GT(sim::compressionDb(tilted, psat - 150.0, f), -1e-6);
+            EXPECT_NEAR(3.0 * sim::compressionDb(tilted, psat + 4.0, f),
+                        sim::compressionPhaseDeg(tilted, psat + 4.0, f), 1e-12);
         }
-        // At saturation the compression is (10/s) log10(2), and far below it nothing.
-        EXPECT_NEAR(-10.0 / s * std::log10(2.0), sim::compressionDb(r, -7.0), 1e-12);
-        EXPECT_GT(sim::compressionDb(r, -150.0), -1e-6);
-        EXPECT_NEAR(3.0 * sim::compressionDb(r, -3.0), sim::compressionPhaseDeg(r, -3.0), 1e-12);
     }
 }
 
@@ -56,6 +79,58 @@ class Physics : public SimFixture {
     }
 };
 
+// A receiver whose Psat changes by several dB per GHz reads, at every point of every sweep
+// type, the compression of that point's frequency.
+TEST_F(Physics, EverySweepTypeReadsEachPointAtItsOwnFrequency) {
+    start(R"({"receivers": {"A": {"psat_dbm": -14.0, "psat_slope_db_per_ghz": 2.0,
+                                  "psat_ripple_db": 3.0, "psat_ripple_period_ghz": 3.0}}})");
+    const auto& a = m_analyzer->scenario().receiver("A");
+    scpi("CALC:PAR:DEL:ALL");
+    scpi("CALC:PAR:DEF:EXT \"m\",\"A,1\"");
+    scpi("SOUR:POW -10,\"PORT 1\"");
+    auto ch = channel();
+    auto expectReadings = [&](const std::string& sweep, const std::vector<double>& frequencies,
+                              const std::vector<double>& powers) {
+        ch->singleSweep();
+        auto trace = read("m");
+        ASSERT_EQ(frequencies.size(), trace.size()) << sweep;
+        for (std::size_t i = 0; i < trace.size(); ++i) {
+            EXPECT_NEAR(powers[i] + sim::compressionDb(a, powers[i], frequencies[i]), trace[i],
+                        1e-4)
+                << sweep << " point " << i;
+        }
+    };
+
+    ch->setSweepType(0);
+    ch->setNumberOfPoints(5);
+    const double start = ch->startFrequency();
+    const double step = (ch->stopFrequency() - start) / 4.0;
+    expectReadings("linear",
+                   {start, start + step, start + 2 * step, start + 3 * step, start + 4 * step},
+                   std::vector<double>(5, -10.0));
+    ch->setNumberOfPoints(1);
+    expectReadings("linear, one point", {start}, {-10.0});
+
+    ch->setSweepType(3);
+    ch->setCwFrequency(7.3e9);
+    ch->setNumberOfPoints(3);
+    expectReadings("CW", {7.3e9, 7.3e9, 7.3e9}, {-10.0, -10.0, -10.0});
+
+    ch->setSweepType(2);
+    ch->setStartPower(-20.0);
+    ch->setStopPower(0.0);
+    expectReadings("power", {7.3e9, 7.3e9, 7.3e9}, {-20.0, -10.0, 0.0});
+
+    auto table = automation::queryInterface<automation::SegmentTable>(ch->segmentTable());
+    ASSERT_TRUE(table);
+    table->writeTable({{1, 3, 1e9, 2e9, 1000, 0, 0},
+                       {0, 4, 5e9, 6e9, 1000, 0, 0},
+                       {1, 1, 9e9, 9.5e9, 1000, 0, 0},
+                       {1, 2, 12e9, 12.6e9, 1000, 0, 0}});
+    ch->setSweepType(4);
+    expectReadings("segment", {1e9, 1.5e9, 2e9, 9e9, 12e9, 12.6e9}, std::vector<double>(6, -10.0));
+}
+
 // Every point of every receiver's power sweep sits on its own closed-form curve.
 TEST_F(Physics, PowerSweepFollowsEachReceiversOwnCompressionCurve) {
     start(R"({"receivers": {"B": {"psat_dbm": 4.0, "smoothness": 2.0},
@@ -66,7 +141,7 @@ TEST_F(Physics, PowerSweepFollowsEachReceiversOwnCompressionCurve) {
         ASSERT_EQ(76u, trace.size());
         for (std::size_t i = 0; i < trace.size(); i += 5) {
             double pin = -60.0 + static_cast<double>(i);
-            EXPECT_NEAR(pin + sim::compressionDb(physics, pin), trace[i], 1e-4)
+            EXPECT_NEAR(pin + sim::compressionDb(physics, pin, 1e9), trace[i], 1e-4)
                 << receiver << " at " << pin;
         }
     }
@@ -80,8 +155,8 @@ TEST_F(Physics, RatioReadsPadPlusCompressionAndItsPhaseFollowsAmPm) {
     const auto& r1 = m_analyzer->scenario().receiver("R1");
     for (std::size_t i = 0; i < mag.size(); i += 10) {
         double input = -40.0 + static_cast<double>(i) - 20.0;
-        EXPECT_NEAR(20.0 + sim::compressionDb(r1, input), mag[i], 1e-4);
-        EXPECT_NEAR(r1.amPmDegPerDb * sim::compressionDb(r1, input), phase[i], 1e-4);
+        EXPECT_NEAR(20.0 + sim::compressionDb(r1, input, 1e9), mag[i], 1e-4);
+        EXPECT_NEAR(r1.amPmDegPerDb * sim::compressionDb(r1, input, 1e9), phase[i], 1e-4);
     }
 }
 
@@ -97,13 +172,13 @@ TEST_F(Physics, MemoryDivisionLeavesCompressionRelativeToTheReference) {
     scpi("SOUR:POW -5,\"PORT 1\"");
     ch->singleSweep();
     const auto& a = m_analyzer->scenario().receiver("A");
-    double expected = sim::compressionDb(a, -5.0) - sim::compressionDb(a, -25.0);
+    double expected = sim::compressionDb(a, -5.0, 1e9) - sim::compressionDb(a, -25.0, 1e9);
     EXPECT_NEAR(expected, read("measratio")[4], 1e-5);
     // measmag is not divided: it reads the input power plus compression.
-    EXPECT_NEAR(-5.0 + sim::compressionDb(a, -5.0), read("measmag")[0], 1e-5);
+    EXPECT_NEAR(-5.0 + sim::compressionDb(a, -5.0, 1e9), read("measmag")[0], 1e-5);
     // Back to normal display: the ratio reads pad (0) plus compression again.
     scpi("CALC:math:func NORM");
-    EXPECT_NEAR(sim::compressionDb(a, -5.0), read("measratio")[0], 1e-5);
+    EXPECT_NEAR(sim::compressionDb(a, -5.0, 1e9), read("measratio")[0], 1e-5);
 }
 
 // Per-segment powers and point counts are checked through the proxy in ProxyAgainstSimTest.
@@ -118,7 +193,7 @@ TEST_F(Physics, SegmentSweepWithoutPerSegmentPowerUsesThePortPower) {
     EXPECT_DOUBLE_EQ(4e9, ch->stopFrequency());
     ch->singleSweep();
     const auto& c = m_analyzer->scenario().receiver("C");
-    EXPECT_NEAR(-12.0 + sim::compressionDb(c, -12.0), read("measmag")[4], 1e-5);
+    EXPECT_NEAR(-12.0 + sim::compressionDb(c, -12.0, 4e9), read("measmag")[4], 1e-5);
     EXPECT_THROW(table->writeTable({{1, 0, 1e9, 2e9, 1000, 0, 0}}), std::string);
     EXPECT_THROW(table->writeTable({{1, 5, 3e9, 2e9, 1000, 0, 0}}), std::string);
 }

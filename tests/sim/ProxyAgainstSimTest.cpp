@@ -71,7 +71,7 @@ TEST_F(ProxyAgainstSim, CheckErrorsDrainsTheQueue) {
 }
 
 TEST_F(ProxyAgainstSim, SegmentSweepReadsCompressionThroughTheProxy) {
-    start("{}");
+    start(R"({"receivers": {"A": {"psat_slope_db_per_ghz": -1.5}}})");
     m_proxy->preparecal();
     m_proxy->sendscpi("CALC:PAR:DEL:ALL");
     m_proxy->sendscpi("CALC:PAR:DEF:EXT \"measmag\",\"A,1\"");
@@ -85,9 +85,9 @@ TEST_F(ProxyAgainstSim, SegmentSweepReadsCompressionThroughTheProxy) {
     EXPECT_EQ(8, m_proxy->readdata("measmag", "logmag", mag));
     EXPECT_EQ(8, m_proxy->readdata("measratio", "LOGMAG", ratio));
     const auto& a = m_analyzer->scenario().receiver("A");
-    EXPECT_NEAR(-25.0 + sim::compressionDb(a, -25.0), mag[0], 1e-4);
-    EXPECT_NEAR(-5.0 + sim::compressionDb(a, -5.0), mag[7], 1e-4);
-    EXPECT_NEAR(sim::compressionDb(a, -5.0), ratio[7], 1e-4);
+    EXPECT_NEAR(-25.0 + sim::compressionDb(a, -25.0, 1e9), mag[0], 1e-4);
+    EXPECT_NEAR(-5.0 + sim::compressionDb(a, -5.0, 4e9), mag[7], 1e-4);
+    EXPECT_NEAR(sim::compressionDb(a, -5.0, 4e9), ratio[7], 1e-4);
     EXPECT_THROW(m_proxy->readdata("measratio", "SMITH", ratio), std::string);
     std::string errors;
     EXPECT_EQ(0, m_proxy->checkerrors(errors)) << errors;

@@ -22,14 +22,24 @@ TEST(Scenario, EmptyObjectIsAFourPortAnalyzerWithoutOptions) {
 // Stored images and every fault are read by the flash and bench tests, which use them.
 TEST(Scenario, ReadsPortCountAppDirAndReceiverDefaultsFieldByField) {
     auto s = sim::Scenario::fromJson(R"({"port_count": 2, "app_dir": "D:\\NA",
-        "receivers": {"*": {"psat_dbm": 10.0, "smoothness": 2.0, "am_pm_deg_per_db": 1.5},
-                      "R1": {"psat_dbm": -12.0}}})");
+        "receivers": {"*": {"psat_dbm": 10.0, "smoothness": 2.0, "am_pm_deg_per_db": 1.5,
+                            "psat_slope_db_per_ghz": -0.1, "psat_ripple_db": 0.3},
+                      "R1": {"psat_dbm": -12.0, "psat_ripple_period_ghz": 2.5},
+                      "A": {"psat_ripple_db": 0, "psat_ripple_period_ghz": 0}}})");
     EXPECT_EQ((std::vector<std::string>{"R1", "R2", "A", "B"}), s.receiverNames());
     EXPECT_EQ("D:\\NA", s.appDir);
     EXPECT_DOUBLE_EQ(-12.0, s.receiver("R1").psatDbm);
     EXPECT_DOUBLE_EQ(2.0, s.receiver("R1").smoothness);
     EXPECT_DOUBLE_EQ(1.5, s.receiver("R1").amPmDegPerDb);
     EXPECT_DOUBLE_EQ(10.0, s.receiver("B").psatDbm);
+    EXPECT_DOUBLE_EQ(-0.1, s.receiver("R1").psatSlopeDbPerGhz);
+    EXPECT_DOUBLE_EQ(0.3, s.receiver("R1").psatRippleDb);
+    EXPECT_DOUBLE_EQ(2.5, s.receiver("R1").psatRipplePeriodGhz);
+    EXPECT_DOUBLE_EQ(5.0, s.receiver("B").psatRipplePeriodGhz);
+    EXPECT_DOUBLE_EQ(0.0, s.receiver("A").psatRippleDb);
+    auto flat = sim::Scenario::fromJson("{}");
+    EXPECT_DOUBLE_EQ(0.0, flat.receiver("C").psatSlopeDbPerGhz);
+    EXPECT_DOUBLE_EQ(0.0, flat.receiver("C").psatRippleDb);
 }
 
 TEST(Scenario, ErrorsNameTheKeyAndTheProblem) {
@@ -62,6 +72,18 @@ TEST(Scenario, ErrorsNameTheKeyAndTheProblem) {
               errorOf(R"({"idn": "T3872A"})"));
     EXPECT_EQ("scenario: \"receivers.A.smoothness\" must be greater than 0",
               errorOf(R"({"receivers": {"A": {"smoothness": 0}}})"));
+    EXPECT_EQ("scenario: \"receivers.*.psat_slope_db_per_ghz\" must be a number, not a string",
+              errorOf(R"({"receivers": {"*": {"psat_slope_db_per_ghz": "steep"}}})"));
+    // The period is checked once "*" and the receiver's own fields are merged.
+    EXPECT_EQ(
+        "scenario: \"receivers.B.psat_ripple_period_ghz\" must be greater than 0 while "
+        "\"psat_ripple_db\" is not 0",
+        errorOf(
+            R"({"receivers": {"*": {"psat_ripple_period_ghz": 0}, "B": {"psat_ripple_db": 1}}})"));
+    EXPECT_EQ(
+        "scenario: \"receivers.*.psat_ripple_period_ghz\" must be greater than 0 while "
+        "\"psat_ripple_db\" is not 0",
+        errorOf(R"({"receivers": {"*": {"psat_ripple_db": 0.3, "psat_ripple_period_ghz": -5}}})"));
     EXPECT_EQ(0u, errorOf("{").rfind("scenario: invalid JSON: ", 0));
 }
 
