@@ -29,6 +29,9 @@ int CTarvexApp::run(const ModalLoop& modalLoop) {
         throw;
     }
     dlg.shutdown();
+    if (status == 0 && dlg.anyRunFailed()) {
+        status = exitRunFailed;
+    }
     if (m_services.signals.restartRequested) {
         restartAnalyzerApplication(dlg.applicationDirectory());
     }

@@ -12,6 +12,8 @@ namespace app {
 
 class CTarvexApp {
   public:
+    static constexpr int exitRunFailed = 3;
+
     // The front end's modal loop: handles the operator's actions, the UI work handed in by
     // the worker and the dialog's timer until dlg.ended().
     using ModalLoop = std::function<void(CTarvexDlg& dlg)>;
@@ -19,9 +21,10 @@ class CTarvexApp {
     CTarvexApp(DialogView& view, DialogServices& services, UiTaskQueue& queue)
         : m_view(view), m_services(services), m_queue(queue) {}
 
-    // Returns the exit status: 0 when the dialog ended by Exit or Close, 1 when an error
-    // text (or the analyzer's "Critical Error") ended it. A ProgramStop from the front end
-    // passes through after the dialog has been shut down, without the restart.
+    // Returns the exit status: 0 when the dialog ended by Exit or Close and every run it
+    // started finished, 1 when an error text (or the analyzer's "Critical Error") ended it,
+    // 3 when it ended normally but a run ended on an error or an abort. A ProgramStop from
+    // the front end passes through after the dialog has been shut down, without the restart.
     int run(const ModalLoop& modalLoop);
 
     // The restart program's command line for an application directory.

@@ -212,6 +212,9 @@ void CTarvexDlg::startWorker(const std::vector<std::string>& receivers) {
             // Whatever escaped the run (a front end stopping the program) ends it as failed.
         }
         m_workerExitCode = code;
+        if (code != 0) {
+            m_anyRunFailed = true;
+        }
         m_services.signals.workerRunning = false;
         m_workerThreadDone = true;
         m_queue.wake();

@@ -91,6 +91,9 @@ class CTarvexDlg {
     CNetworkAnalyzer* proxy() const { return m_proxy.get(); }
     // Exit code of the last worker (0 complete, 1 error or abort); -1 before any run.
     int lastWorkerExitCode() const { return m_workerExitCode.load(); }
+    // Some run since the dialog opened ended on an error or an abort, so it did not store
+    // everything it measured.
+    bool anyRunFailed() const { return m_anyRunFailed.load(); }
 
   private:
     struct RunRequest;
@@ -156,6 +159,7 @@ class CTarvexDlg {
     std::thread m_worker;
     std::atomic<bool> m_workerThreadDone{true};
     std::atomic<int> m_workerExitCode{-1};
+    std::atomic<bool> m_anyRunFailed{false};
 };
 
 }  // namespace app

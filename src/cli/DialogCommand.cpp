@@ -33,8 +33,9 @@ logged). At the end of the script Exit is pressed. Boxes are answered from --ans
 Cancel, Retest, Quit, Continue) or --yes. Notices and boxes ("[CAPTION] TEXT => ANSWER")
 go to standard output.
 
-Exit status: 0 the dialog ended by Exit or Close, 1 an error ended it, 4 a box had no
-answer (its caption and text on stderr).
+Exit status: 0 the dialog ended by Exit or Close and every run finished, 1 an error
+ended the dialog, 3 it ended normally but a run ended on an error ("Error in Cal") or was
+aborted, 4 a box had no answer (its caption and text on stderr).
 
 Example:
   printf 'clear\nselect R1,A\nrun\nwait\n' |

@@ -38,6 +38,7 @@ Instrument::Instrument(Scenario scenario, std::filesystem::path stateDirectory,
             bench.badDataLeft = it->second;
         }
     }
+    m_corruptFlashWritesLeft = m_scenario.faults.corruptFlashWrites;
     buildCommands();
     seedStoredCalibrations();
     preset();

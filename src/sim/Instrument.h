@@ -315,6 +315,7 @@ class Instrument {
 
     // Physical, survives restarts.
     std::map<std::string, BenchState> m_bench;
+    std::map<std::string, int> m_corruptFlashWritesLeft;
 };
 
 }  // namespace sim

@@ -190,6 +190,13 @@ void Instrument::addDiagnosticCommands() {
         while (c.parameters.nextWord(word)) {
             words.push_back(word);
         }
+        auto fault = m_corruptFlashWritesLeft.find(scpi::upperCased(name));
+        if (fault != m_corruptFlashWritesLeft.end() && fault->second > 0 && !words.empty()) {
+            --fault->second;
+            words[words.size() / 2] ^= 0x0100;
+            m_transcript.record('#', "flash: stored word " + std::to_string(words.size() / 2) +
+                                         " of " + name + " wrong");
+        }
         m_flash.write(file, name, words, std::chrono::system_clock::now());
         return std::string();
     });

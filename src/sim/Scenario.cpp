@@ -139,7 +139,7 @@ void readFaults(Scenario& scenario, const json& value) {
     expectObject(value, "faults");
     rejectUnknownKeys(value,
                       {"disconnected", "wrong_pad_db", "narrowband_loss_db", "attenuator_reply",
-                       "bad_data", "scpi_errors"},
+                       "bad_data", "corrupt_flash_writes", "scpi_errors"},
                       "faults");
     auto count = [](const json& v, const std::string& k) {
         long n = readInteger(v, k);
@@ -155,6 +155,10 @@ void readFaults(Scenario& scenario, const json& value) {
     }
     if (value.contains("bad_data")) {
         f.badData = readReceiverMap<int>(scenario, value["bad_data"], "faults.bad_data", count);
+    }
+    if (value.contains("corrupt_flash_writes")) {
+        f.corruptFlashWrites = readReceiverMap<int>(scenario, value["corrupt_flash_writes"],
+                                                    "faults.corrupt_flash_writes", count);
     }
     if (value.contains("wrong_pad_db")) {
         f.wrongPadDb = readReceiverMap<double>(scenario, value["wrong_pad_db"],

@@ -46,6 +46,8 @@ struct Faults {
     std::map<std::string, double> narrowbandLossDb;
     std::map<std::string, std::string> attenuatorReply;
     std::map<std::string, int> badData;
+    // Flash writes of the receiver's calibration that store one word wrong.
+    std::map<std::string, int> corruptFlashWrites;
     std::vector<ScpiErrorRule> scpiErrors;
 };
 

@@ -1,5 +1,6 @@
 #include "storage/FlashTransfer.h"
 
+#include <algorithm>
 #include <chrono>
 
 #include "storage/DataFile.h"
@@ -32,6 +33,26 @@ void pushPortFile(const StorageContext& context, const std::string& receiver,
     context.analyzer.sendscpi(command);
     context.clock.wait(kSettle);
     reportAnalyzerErrors(context, "SCPI Error Writing Flash");
+}
+
+void writeFlashVerified(const StorageContext& context, const std::string& file,
+                        const std::string& name, const RcvrCharImage& image) {
+    context.analyzer.flasharray(file, name, image.words());
+    const RcvrCharImage stored = RcvrCharImage::fromFlashReply(
+        context.analyzer.sendscpi("DIAG:FLASHARRAY? \"" + file + "\",\"" + name + "\""));
+    const auto& written = image.words();
+    const auto& read = stored.words();
+    if (read == written) {
+        return;
+    }
+    const auto [w, r] = std::mismatch(written.begin(), written.end(), read.begin(), read.end());
+    std::string where = w == written.end() || r == read.end()
+                            ? std::to_string(read.size()) + " words read back, " +
+                                  std::to_string(written.size()) + " written"
+                            : "word " + std::to_string(w - written.begin()) + " reads " +
+                                  std::to_string(*r) + ", " + std::to_string(*w) + " was written";
+    throw std::string("The characterization of " + name + " did not read back from flash as " +
+                      "written (" + where + "); it is not counted as stored.");
 }
 
 bool reloadFromFlash(const StorageContext& context, bool& needsPreparation) {

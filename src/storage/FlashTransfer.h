@@ -17,6 +17,12 @@ namespace storage {
 void pushPortFile(const StorageContext& context, const std::string& receiver,
                   const RcvrCharImage& image);
 
+// Writes the image into the analyzer's flash and reads it back: raises an error text naming
+// the receiver and the first differing word unless the flash holds exactly what was
+// written, so that a receiver is never counted as characterized on a corrupted copy.
+void writeFlashVerified(const StorageContext& context, const std::string& file,
+                        const std::string& name, const RcvrCharImage& image);
+
 // Makes the analyzer reload its stored characterizations; analyzer errors are shown and
 // logged. Always sets needsPreparation (the analyzer must be prepared again before the next
 // run) and returns true.

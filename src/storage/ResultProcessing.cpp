@@ -259,7 +259,7 @@ bool processResults(StorageContext& context, MeasuredResults& store, const std::
     if (mmwave) {
         pushPortFile(context, name, judgement.image);
     } else {
-        context.analyzer.flasharray("RcvrChar", name, judgement.image.words());
+        writeFlashVerified(context, "RcvrChar", name, judgement.image);
     }
     context.log.append("diag:fcal:load");
     context.analyzer.sendscpi("diag:fcal:load");

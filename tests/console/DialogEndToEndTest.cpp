@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include "app/CTarvexApp.h"
+
 #include "ConsoleRun.h"
 #include "config/T3872Acomcal.h"
 
@@ -90,9 +92,10 @@ TEST(DialogRunRules, NothingSelectedStillAsksToReloadAndExitsWithoutRestart) {
 TEST(ThreadedDialogRunRules, PortReceiverWithoutItsStoredReferenceGetsItAddedAndStops) {
     ConsoleRun run;
     // The first Run adds R1 and stops; the second, from the adjusted selection, splits.
+    // The aborted first run did not store what it measured.
     ASSERT_EQ(run.run("clear\nselect A\nrun\non Started Cal R1: abort\nrun\nwait\n",
                       kOperator + "Cal selections adjusted = OK\nAbort now? = Yes\n"),
-              0)
+              app::CTarvexApp::exitRunFailed)
         << run.err();
     EXPECT_TRUE(run.inOrder({
         "[Cal selections adjusted] There is no cal data saved for receiver 'R1', upon which the "
@@ -170,7 +173,7 @@ TEST(ThreadedDialogMonitoring, CloseAndExitDuringARunStopTheWorkerBeforeTheDialo
     for (const std::string action : {"close", "exit"}) {
         ConsoleRun run;
         ASSERT_EQ(run.run("clear\nselect R1\non Started Cal R1: " + action + "\nrun\n", kOperator),
-                  0)
+                  app::CTarvexApp::exitRunFailed)
             << run.err();
         EXPECT_TRUE(run.inOrder({
             "Started Cal R1\n",
@@ -220,7 +223,7 @@ TEST(ThreadedDialogBadData, TheThreeChoicesOfTheBadDataDialog) {
     {
         ConsoleRun run(scenario);
         ASSERT_EQ(run.run(script, kOperator + "Characterization data issue! = Quit\nError = OK\n"),
-                  0)
+                  app::CTarvexApp::exitRunFailed)
             << run.err();
         EXPECT_TRUE(run.inOrder({prompt + "Quit\n",
                                  "[Error] User aborted characterization due to bad data on "
@@ -297,4 +300,19 @@ TEST(DialogConsole, UnknownReceiverInTheScriptEndsWithStatusOne) {
               "rcvrchar: script line 1: no receiver named \"Z\" in the list (R1, R2, R3, R4, A, "
               "B, C, D)\n");
     EXPECT_FALSE(run.has("Cal Started"));
+}
+
+// A flash copy that does not read back as written fails the run: the receiver is not
+// counted as characterized and the dialog ends with the failed-run status.
+TEST(ThreadedDialogEndToEnd, FlashThatDoesNotReadBackAsWrittenFailsTheRun) {
+    ConsoleRun run(R"({"options": "010,080", "faults": {"corrupt_flash_writes": {"R1": 1}}})");
+    ASSERT_EQ(run.run("clear\nselect R1\nrun\nwait\n", kOperator + "Error = OK\n"),
+              app::CTarvexApp::exitRunFailed)
+        << run.err();
+    EXPECT_TRUE(run.inOrder({"Writing Cal File\n",
+                             "[Error] The characterization of R1 did not read back from flash as "
+                             "written (word ",
+                             "); it is not counted as stored. => OK\n", "Error in Cal\n"}))
+        << run.out();
+    EXPECT_FALSE(run.has("Cal Complete"));
 }

@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include "app/CTarvexApp.h"
+
 #include <mutex>
 #include <set>
 #include <streambuf>
@@ -133,7 +135,7 @@ TEST(ThreadedInteractiveConsole, AbortTypedWhileAWorkerBoxWaitsEndsTheRunOnceItI
                                              {"", "run"},
                                              {"[Connections] ", "abort"},
                                              {"Characterization Aborted", "exit"}});
-    EXPECT_EQ(session.status, 0) << session.run.err() << screen;
+    EXPECT_EQ(session.status, app::CTarvexApp::exitRunFailed) << session.run.err() << screen;
     // The question about aborting comes while the worker's box is still open; the worker
     // stops as soon as its box is answered, before its first power level.
     EXPECT_TRUE(inOrder(screen, {"[Connections] ", "[Abort now?] ", "  => Yes\n", "  => OK\n",

@@ -1,6 +1,8 @@
 
 #include <gtest/gtest.h>
 
+#include "app/CTarvexApp.h"
+
 #include <QApplication>
 #include <QLabel>
 #include <QListWidget>
@@ -75,14 +77,15 @@ void whenIdle(qttest::WindowOperator& op, const TarvexWindow& w, std::function<v
         "the idle dialog", [&w] { return idle(w); }, std::move(act));
 }
 
-// Runs the window with these operator steps; it must end normally with every step done.
+// Runs the window with these operator steps; it must end with the status and every step done.
 void runWindow(qttest::WindowBench& bench, qttest::WindowOperator& op,
-               const std::function<void(qtui::QtFrontEndParts&, TarvexWindow&)>& steps) {
+               const std::function<void(qtui::QtFrontEndParts&, TarvexWindow&)>& steps,
+               int expectedStatus = 0) {
     const int status = bench.run([&](qtui::QtFrontEndParts& parts) {
         steps(parts, parts.window);
         op.start();
     });
-    EXPECT_EQ(status, 0);
+    EXPECT_EQ(status, expectedStatus);
     EXPECT_TRUE(op.allStepsDone());
 }
 
@@ -250,28 +253,31 @@ TEST(QtMainWindow, AbortStaysUsableWhileAWorkerBoxIsOpen) {
     op.answerBoxesByDefault();  // "Abort now?" is confirmed by its default Yes
     op.hold("Connections");
     QString logAfterAbort;
-    runWindow(bench, op, [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
-        whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
-        op.then(
-            "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
-            [&] {
-                EXPECT_EQ(parts.ui.openWorkerBoxes(), 1u);
-                EXPECT_TRUE(control<QPushButton>(w, 1001)->isEnabled());
-                // The dialog is not blocked by the worker's box.
-                EXPECT_EQ(QApplication::activeModalWidget(), nullptr);
-                click(w, 1001);
-            });
-        op.then(
-            "the abort request", [&] { return logOf(w).contains("Abort Requested\n"); },
-            [&] {
-                logAfterAbort = logOf(w);
-                EXPECT_FALSE(control<QPushButton>(w, 1001)->isEnabled());
-                EXPECT_TRUE(w.controller()->workerRunning());
-                op.release();
-            });
-        op.then(
-            "the aborted run", [&] { return idle(w); }, [&] { click(w, 1); });
-    });
+    runWindow(
+        bench, op,
+        [&](qtui::QtFrontEndParts& parts, TarvexWindow& w) {
+            whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
+            op.then(
+                "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
+                [&] {
+                    EXPECT_EQ(parts.ui.openWorkerBoxes(), 1u);
+                    EXPECT_TRUE(control<QPushButton>(w, 1001)->isEnabled());
+                    // The dialog is not blocked by the worker's box.
+                    EXPECT_EQ(QApplication::activeModalWidget(), nullptr);
+                    click(w, 1001);
+                });
+            op.then(
+                "the abort request", [&] { return logOf(w).contains("Abort Requested\n"); },
+                [&] {
+                    logAfterAbort = logOf(w);
+                    EXPECT_FALSE(control<QPushButton>(w, 1001)->isEnabled());
+                    EXPECT_TRUE(w.controller()->workerRunning());
+                    op.release();
+                });
+            op.then(
+                "the aborted run", [&] { return idle(w); }, [&] { click(w, 1); });
+        },
+        app::CTarvexApp::exitRunFailed);
     expectInOrder(op.captions(), {"Connections", "Abort now?"});
     EXPECT_FALSE(logAfterAbort.contains("Characterization Aborted"));
 }
@@ -283,24 +289,28 @@ TEST(QtMainWindow, CloseDuringARunEndsOnlyAfterTheWorkerHasStopped) {
     op.hold("Connections");
     bool workerRunningAtEnd = true;
     QString finalLog;
-    runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
-        QObject::connect(&w, &TarvexWindow::dialogEnded, [&] {
-            workerRunningAtEnd = w.controller()->workerRunning();
-            finalLog = logOf(w);
-        });
-        whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
-        op.then(
-            "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
-            [&] { w.close(); });
-        op.then(
-            "the close request", [&] { return logOf(w).contains("Aborting Characterization\n"); },
-            [&] {
-                EXPECT_TRUE(w.isVisible());
-                EXPECT_FALSE(w.ended());
-                EXPECT_TRUE(w.controller()->workerRunning());
-                op.release();
+    runWindow(
+        bench, op,
+        [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
+            QObject::connect(&w, &TarvexWindow::dialogEnded, [&] {
+                workerRunningAtEnd = w.controller()->workerRunning();
+                finalLog = logOf(w);
             });
-    });
+            whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
+            op.then(
+                "the worker's Connections box", [&] { return op.heldBox() != nullptr; },
+                [&] { w.close(); });
+            op.then(
+                "the close request",
+                [&] { return logOf(w).contains("Aborting Characterization\n"); },
+                [&] {
+                    EXPECT_TRUE(w.isVisible());
+                    EXPECT_FALSE(w.ended());
+                    EXPECT_TRUE(w.controller()->workerRunning());
+                    op.release();
+                });
+        },
+        app::CTarvexApp::exitRunFailed);
     EXPECT_FALSE(workerRunningAtEnd);
     EXPECT_TRUE(finalLog.contains("Aborting Characterization\nCharacterization Aborted\n"))
         << finalLog.toStdString();

@@ -5,9 +5,9 @@
 // written to standard output. Interactive: the operator types the buttons as commands and
 // answers each box at its prompt.
 //
-// Both return the exit status: 0 when the dialog ended by Exit or Close, 1 when an error
-// text ended it (or the script named a receiver that is not in the list), 4 when a box
-// could not be answered.
+// Both return the exit status (README, "Exit status"): 0, 1 when an error text ended the
+// dialog (or the script named a receiver that is not in the list), 3 when a run failed,
+// 4 when a box could not be answered.
 
 #include <atomic>
 #include <filesystem>

@@ -48,7 +48,7 @@ struct QtSetup {
 // QT_QPA_PLATFORM, WAYLAND_DISPLAY and DISPLAY (a local X display must have its socket).
 std::optional<std::string> missingDisplay();
 
-// Runs the dialog in a window and returns the exit status (0 Exit/Close, 1 error). Creates
+// Runs the dialog in a window and returns the exit status (README, "Exit status"). Creates
 // the QApplication when there is none; without a display it writes why to err and
 // returns 1.
 int runQtDialog(QtSetup& setup, std::ostream& err);
