@@ -12,6 +12,7 @@
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
 #include "cli/GuiCommand.h"
+#include "cli/WorkFolderLock.h"
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "platform/RunSignals.h"
 #include "sim/SimulatedAnalyzer.h"
@@ -66,6 +67,7 @@ struct DialogOptions {
 };
 
 int runDialog(const DialogOptions& options) {
+    const cli::WorkFolderLocks locks(options.analyzer, "the dialog");
     if (options.gui) {
         return cli::runGuiDialog(options.analyzer);
     }
