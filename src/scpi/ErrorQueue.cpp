@@ -23,4 +23,23 @@ std::string ErrorQueue::pop() {
     return entry;
 }
 
+std::string ErrorQueue::popAll() {
+    if (m_entries.empty()) {
+        return pop();
+    }
+    std::size_t size = m_entries.size();
+    for (const auto& entry : m_entries) {
+        size += entry.size();
+    }
+    std::string all;
+    all.reserve(size);
+    for (const auto& entry : m_entries) {
+        all += entry;
+        all += ',';
+    }
+    all.pop_back();
+    m_entries.clear();
+    return all;
+}
+
 }  // namespace scpi

@@ -18,8 +18,11 @@ class ErrorQueue {
     void pushText(const std::string& entry);
     // The oldest entry, or 0,"No error" when empty.
     std::string pop();
+    // Every entry, oldest first, joined by commas (SYST:ERR:ALL?); 0,"No error" when empty.
+    std::string popAll();
     void clear() { m_entries.clear(); }
     std::size_t size() const { return m_entries.size(); }
+    bool empty() const { return m_entries.empty(); }
 
   private:
     std::deque<std::string> m_entries;

@@ -1,8 +1,11 @@
 #include "scpi/ProgramMessage.h"
 
+#include <algorithm>
 #include <cctype>
 #include <charconv>
 #include <cmath>
+
+#include "scpi/Block.h"
 
 namespace scpi {
 namespace {
@@ -23,6 +26,24 @@ constexpr Suffix suffixes[] = {
     {"MA", 1e6},  {"K", 1e3},   {"M", 1e-3},  {"U", 1e-6},   {"N", 1e-9},
 };
 
+// Where the definite-length block whose "#" is at `hash` ends (clamped to the text), or
+// npos when no well-formed block starts there: "#H1F" is a hexadecimal number, and a bad
+// header is left for ParameterReader::block() to report.
+std::size_t blockEnd(std::string_view text, std::size_t hash) {
+    if (hash + 1 >= text.size() || text[hash + 1] < '1' || text[hash + 1] > '9') {
+        return std::string_view::npos;
+    }
+    try {
+        auto header = readBlockHeader(text.substr(hash));
+        if (!header) {
+            return std::string_view::npos;
+        }
+        return hash + std::min(text.size() - hash, header->headerBytes + header->dataBytes);
+    } catch (const Error&) {
+        return std::string_view::npos;
+    }
+}
+
 }  // namespace
 
 std::string upperCased(std::string_view text) {
@@ -37,13 +58,16 @@ std::vector<std::string_view> splitMessageUnits(std::string_view message) {
     std::vector<std::string_view> units;
     char quote = 0;
     std::size_t start = 0;
+    // Trailing blanks are trimmed only after the unit's last block: its bytes are data.
+    std::size_t lastBlockEnd = 0;
     auto add = [&](std::size_t end) {
         std::string_view unit = message.substr(start, end - start);
+        std::size_t keep = lastBlockEnd > start ? lastBlockEnd - start : 0;
+        while (unit.size() > keep && isBlank(unit.back())) {
+            unit.remove_suffix(1);
+        }
         while (!unit.empty() && isBlank(unit.front())) {
             unit.remove_prefix(1);
-        }
-        while (!unit.empty() && isBlank(unit.back())) {
-            unit.remove_suffix(1);
         }
         if (!unit.empty()) {
             units.push_back(unit);
@@ -57,6 +81,12 @@ std::vector<std::string_view> splitMessageUnits(std::string_view message) {
             }
         } else if (c == '"' || c == '\'') {
             quote = c;
+        } else if (c == '#') {
+            std::size_t end = blockEnd(message, i);
+            if (end != std::string_view::npos) {
+                lastBlockEnd = end;
+                i = end - 1;
+            }
         } else if (c == ';') {
             add(i);
             start = i + 1;
@@ -179,6 +209,28 @@ std::string ParameterReader::string() {
     return value;
 }
 
+std::string_view ParameterReader::block() {
+    expectParameter();
+    if (m_text[m_pos] != '#') {
+        throw Error{-104, "Data type error; block expected"};
+    }
+    std::string_view rest = m_text.substr(m_pos);
+    auto header = readBlockHeader(rest);
+    if (!header) {
+        throw Error{-161, "Invalid block data; the block header is cut short"};
+    }
+    std::size_t available = rest.size() - std::min(rest.size(), header->headerBytes);
+    if (available < header->dataBytes) {
+        throw Error{-161, "Invalid block data; block announces " +
+                              std::to_string(header->dataBytes) + " bytes but only " +
+                              std::to_string(available) + " follow"};
+    }
+    std::string_view data = rest.substr(header->headerBytes, header->dataBytes);
+    m_pos += header->headerBytes + header->dataBytes;
+    endParameter();
+    return data;
+}
+
 double ParameterReader::number() {
     std::string_view token = rawToken();
     if (!token.empty() && token.front() == '+') {
@@ -195,12 +247,12 @@ double ParameterReader::number() {
     }
     if (!rest.empty()) {
         std::string unit = upperCased(rest);
-        for (const auto& suffix : suffixes) {
-            if (unit == suffix.text) {
-                return value * suffix.factor;
-            }
+        auto suffix = std::find_if(std::begin(suffixes), std::end(suffixes),
+                                   [&](const Suffix& s) { return unit == s.text; });
+        if (suffix == std::end(suffixes)) {
+            throw Error{-131, "Invalid suffix \"" + std::string(rest) + "\""};
         }
-        throw Error{-131, "Invalid suffix \"" + std::string(rest) + "\""};
+        value *= suffix->factor;
     }
     if (!std::isfinite(value)) {
         throw Error{-222, "Data out of range"};

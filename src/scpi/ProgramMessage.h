@@ -1,8 +1,9 @@
 #pragma once
 
-// SCPI message syntax as the simulated instrument reads it: program message units split at
+// SCPI message syntax as an instrument reads it: program message units split at
 // semicolons, a header of colon-separated mnemonics (with "?" for queries), and parameters:
-// quoted strings, numbers in any SCPI form (with unit suffixes), booleans and words.
+// quoted strings, numbers in any SCPI form (with unit suffixes), booleans, words and
+// definite-length blocks.
 
 #include <cstdint>
 #include <string>
@@ -11,16 +12,18 @@
 
 namespace scpi {
 
-// An instrument-side error: queued as code,"message"; never leaves the parser.
 // Keywords and words compare as the "C" locale upper-cases them.
 std::string upperCased(std::string_view text);
 
+// An instrument-side error: queued as code,"message"; never leaves the parser.
 struct Error {
     int code;
     std::string message;
 };
 
-// Units of one message, split at semicolons outside quoted strings; empty units dropped.
+// Units of one message, split at semicolons outside quoted strings and definite-length
+// blocks; empty units dropped. Never throws: a malformed block is left for the parameter
+// reader to report.
 std::vector<std::string_view> splitMessageUnits(std::string_view message);
 
 struct CommandHeader {
@@ -41,6 +44,9 @@ class ParameterReader {
     std::string string();
     double number();
     bool boolean();
+    // The bytes of a definite-length block. Throws -104 when the parameter is not a block,
+    // -161 when its header is bad or its data is shorter than announced.
+    std::string_view block();
     // Character data, upper-cased.
     std::string word();
     // The next parameter if it is an unsigned integer that fits 16 bits; false at the end.

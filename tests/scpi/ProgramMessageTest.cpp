@@ -43,6 +43,7 @@ TEST(ScpiSyntax, ReadsParametersInEverySciForm) {
     EXPECT_EQ(-109, code("", [](auto& r) { r.number(); }));
     EXPECT_EQ(-109, code("1,", [](auto& r) { r.number(), r.number(); }));
     EXPECT_EQ(-131, code("5 furlongs", [](auto& r) { r.number(); }));
+    EXPECT_EQ(-222, code("inf GHz", [](auto& r) { r.number(); }));
     EXPECT_EQ(-224, code("maybe", [](auto& r) { r.boolean(); }));
 }
 
