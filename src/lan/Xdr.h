@@ -29,6 +29,8 @@ class XdrWriter {
 class XdrReader {
   public:
     explicit XdrReader(std::string_view bytes) : m_bytes(bytes) {}
+    // The reader keeps a view: a temporary string would leave it dangling.
+    explicit XdrReader(std::string&&) = delete;
     std::uint32_t u32(const char* what);
     std::int32_t i32(const char* what) { return static_cast<std::int32_t>(u32(what)); }
     bool boolean(const char* what);
