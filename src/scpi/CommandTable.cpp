@@ -3,8 +3,6 @@
 #include <cctype>
 
 namespace scpi {
-namespace {}  // namespace
-
 void CommandTable::add(std::string_view pattern, CommandHandler handler) {
     Entry entry;
     if (!pattern.empty() && pattern.back() == '?') {
@@ -42,7 +40,7 @@ void CommandTable::add(std::string_view pattern, CommandHandler handler) {
 }
 
 bool CommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
-                              const std::vector<std::string_view>& input, std::size_t i,
+                              const std::vector<std::string>& input, std::size_t i,
                               std::vector<int>& suffixes) {
     if (p == pattern.size()) {
         return i == input.size();
@@ -50,7 +48,7 @@ bool CommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
     const Node& node = pattern[p];
     std::size_t mark = suffixes.size();
     if (i < input.size()) {
-        std::string keyword = upperCased(input[i]);
+        std::string_view keyword = input[i];
         int suffix = 1;
         if (node.numbered) {
             std::size_t digits = keyword.size();
@@ -58,8 +56,11 @@ bool CommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
                 --digits;
             }
             if (digits < keyword.size()) {
-                suffix = std::stoi(keyword.substr(digits, 6));
-                keyword.resize(digits);
+                suffix = 0;
+                for (char c : keyword.substr(digits, 6)) {
+                    suffix = suffix * 10 + (c - '0');
+                }
+                keyword = keyword.substr(0, digits);
             }
         }
         if (keyword == node.shortForm || keyword == node.longForm) {
@@ -84,18 +85,47 @@ bool CommandTable::matchNodes(const std::vector<Node>& pattern, std::size_t p,
     return false;
 }
 
-std::string CommandTable::dispatch(const CommandHeader& header, ParameterReader& parameters) const {
+const CommandTable::Entry* CommandTable::find(const std::vector<std::string>& nodes, bool query,
+                                              std::vector<int>& suffixes) const {
     for (const auto& entry : m_entries) {
-        if (entry.query != header.query) {
+        if (entry.query != query) {
             continue;
         }
-        std::vector<int> suffixes;
-        if (matchNodes(entry.nodes, 0, header.nodes, 0, suffixes)) {
-            CommandContext context{parameters, std::move(suffixes)};
-            return entry.handler(context);
+        suffixes.clear();
+        if (matchNodes(entry.nodes, 0, nodes, 0, suffixes)) {
+            return &entry;
         }
     }
-    throw Error{-113, "Undefined header"};
+    return nullptr;
+}
+
+std::string CommandTable::dispatch(const CommandHeader& header, bool rooted,
+                                   std::vector<std::string>& path,
+                                   ParameterReader& parameters) const {
+    std::vector<std::string> nodes;
+    nodes.reserve(path.size() + header.nodes.size());
+    const bool common = !header.nodes.empty() && header.nodes.front().starts_with('*');
+    if (!rooted && !common) {
+        nodes = path;
+    }
+    for (std::string_view node : header.nodes) {
+        nodes.push_back(upperCased(node));
+    }
+    std::vector<int> suffixes;
+    const Entry* entry = find(nodes, header.query, suffixes);
+    if (!entry && nodes.size() > header.nodes.size()) {
+        nodes.erase(nodes.begin(), nodes.end() - static_cast<long>(header.nodes.size()));
+        entry = find(nodes, header.query, suffixes);
+    }
+    if (!entry) {
+        throw Error{-113, "Undefined header"};
+    }
+    if (!common) {
+        nodes.pop_back();
+        path = std::move(nodes);
+    }
+    CommandContext context{parameters, std::move(suffixes)};
+    return entry->handler(context);
 }
 
 }  // namespace scpi

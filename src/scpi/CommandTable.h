@@ -28,8 +28,13 @@ using CommandHandler = std::function<std::string(CommandContext&)>;
 class CommandTable {
   public:
     void add(std::string_view pattern, CommandHandler handler);
-    // Runs the matching entry; throws Error -113 when no pattern matches.
-    std::string dispatch(const CommandHeader& header, ParameterReader& parameters) const;
+    // Runs the entry that matches the header. A header without a leading colon is first
+    // looked up under `path`, the path the previous unit of the message left (IEEE 488.2),
+    // then from the root, as clients expect of "FORM:BORD SWAP;FORM REAL,64". On a match
+    // `path` becomes the matched header without its last node; common commands ("*...")
+    // leave it alone. Throws Error -113 when nothing matches.
+    std::string dispatch(const CommandHeader& header, bool rooted, std::vector<std::string>& path,
+                         ParameterReader& parameters) const;
 
   private:
     struct Node {
@@ -44,8 +49,10 @@ class CommandTable {
         CommandHandler handler;
     };
     static bool matchNodes(const std::vector<Node>& pattern, std::size_t p,
-                           const std::vector<std::string_view>& input, std::size_t i,
+                           const std::vector<std::string>& input, std::size_t i,
                            std::vector<int>& suffixes);
+    const Entry* find(const std::vector<std::string>& nodes, bool query,
+                      std::vector<int>& suffixes) const;
 
     std::vector<Entry> m_entries;
 };

@@ -60,6 +60,7 @@ void Instrument::restartApplication() {
     m_transcript.record('@', "restart application");
     ++m_generation;
     m_errors.clear();
+    m_status = scpi::StatusRegisters{};
     m_diagStates.clear();
     m_flashLoads = 0;
     preset();
@@ -102,8 +103,10 @@ void Instrument::preset() {
     m_statisticsType = "MEAN";
     m_statistics = false;
     m_lowFrequencyExtension = false;
-    m_dataFormat = "ASC";
-    m_applicationTrigger = 0;
+    m_dataFormat = scpi::DataFormat::Ascii;
+    m_byteOrder = scpi::ByteOrder::Normal;
+    m_triggerSource = TriggerSource::Immediate;
+    m_sweepLeft = std::chrono::milliseconds(0);
     MeasurementState& s11 = defineMeasurement("CH1_S11_1", "S11");
     m_traceFeeds[{1, 1}] = s11.name;
 }
@@ -176,7 +179,7 @@ void Instrument::synthesize(const MeasurementState& m, double sourceDbm, float& 
 }
 
 long Instrument::sweepPoints() const {
-    if (m_channel.sweepType != 4) {
+    if (m_channel.sweepType != SweepType::Segment) {
         return m_channel.points;
     }
     long total = 0;
@@ -193,7 +196,7 @@ std::vector<double> Instrument::pointPowers(int sourcePort) const {
     powers.reserve(static_cast<std::size_t>(sweepPoints()));
     const double source = sourcePowerDbm(sourcePort);
     switch (m_channel.sweepType) {
-        case 2: {
+        case SweepType::Power: {
             const long n = m_channel.points;
             for (long i = 0; i < n; ++i) {
                 double fraction = n > 1 ? static_cast<double>(i) / static_cast<double>(n - 1) : 0;
@@ -202,7 +205,7 @@ std::vector<double> Instrument::pointPowers(int sourcePort) const {
             }
             break;
         }
-        case 4:
+        case SweepType::Segment:
             for (const auto& row : m_channel.segments) {
                 if (row.on != 0) {
                     powers.insert(powers.end(), static_cast<std::size_t>(row.points),
@@ -214,6 +217,57 @@ std::vector<double> Instrument::pointPowers(int sourcePort) const {
             powers.assign(static_cast<std::size_t>(m_channel.points), source);
     }
     return powers;
+}
+
+std::vector<double> Instrument::pointFrequencies() const {
+    std::vector<double> frequencies;
+    frequencies.reserve(static_cast<std::size_t>(sweepPoints()));
+    auto addLine = [&](double start, double stop, long n) {
+        for (long i = 0; i < n; ++i) {
+            double fraction = n > 1 ? static_cast<double>(i) / static_cast<double>(n - 1) : 0;
+            frequencies.push_back(start + fraction * (stop - start));
+        }
+    };
+    switch (m_channel.sweepType) {
+        case SweepType::Linear:
+            addLine(m_channel.startHz, m_channel.stopHz, m_channel.points);
+            break;
+        case SweepType::Segment:
+            for (const auto& row : m_channel.segments) {
+                if (row.on != 0) {
+                    addLine(row.start, row.stop, static_cast<long>(row.points));
+                }
+            }
+            break;
+        default:
+            frequencies.assign(static_cast<std::size_t>(m_channel.points), m_channel.cwHz);
+    }
+    return frequencies;
+}
+
+std::chrono::milliseconds Instrument::sweepDuration() const {
+    return std::chrono::milliseconds(static_cast<long long>(
+        1000.0 * static_cast<double>(sweepPoints()) / m_channel.ifBandwidthHz));
+}
+
+void Instrument::initiate() {
+    if (m_channel.sweepType == SweepType::Segment && sweepPoints() == 0) {
+        throw scpi::Error{-221, "Settings conflict; segment sweep with no segment on"};
+    }
+    sweep();
+    m_sweepLeft = sweepDuration();
+}
+
+void Instrument::waitForSweep(std::chrono::milliseconds limit) {
+    const auto wait = std::min(m_sweepLeft, std::max(limit, std::chrono::milliseconds(0)));
+    m_sweepLeft = std::chrono::milliseconds(0);
+    if (m_heldLock) {
+        m_heldLock->unlock();
+    }
+    m_clock->wait(wait);
+    if (m_heldLock) {
+        m_heldLock->lock();
+    }
 }
 
 void Instrument::sweep() {
@@ -256,10 +310,7 @@ long Instrument::readTrace(int id, int location, int formatCode, long& points,
                            std::span<float> destination) {
     constexpr long badArgument = 0x57;  // the automation layer's "invalid argument"
     constexpr long noData = 0x15;       // "device not ready": nothing swept yet
-    MeasurementState* m = measurementById(id);
-    if (!m) {
-        throw std::string("simulated analyzer: the measurement was deleted");
-    }
+    MeasurementState* m = &measurementNumbered(id);
     if (location != 2) {
         return badArgument;
     }

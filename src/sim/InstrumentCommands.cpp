@@ -1,59 +1,67 @@
-// The SCPI command set of the simulated instrument.
+// How the simulated instrument reads SCPI, and its system, path, diagnostic and flash
+// commands. The other commands live beside the state they change.
 
-#include <cctype>
 #include <charconv>
-#include <cmath>
-#include <cstdio>
 #include <ctime>
-#include <numeric>
 
-#include "platform/UpperCase.h"
+#include "sim/CommandText.h"
 #include "sim/Instrument.h"
 
 namespace sim {
 namespace {
 
 bool startsWithNoCase(std::string_view text, std::string_view prefix) {
-    if (text.size() < prefix.size()) {
-        return false;
-    }
-    for (std::size_t i = 0; i < prefix.size(); ++i) {
-        if (std::toupper(static_cast<unsigned char>(text[i])) !=
-            std::toupper(static_cast<unsigned char>(prefix[i]))) {
-            return false;
-        }
-    }
-    return true;
+    return text.size() >= prefix.size() &&
+           scpi::upperCased(text.substr(0, prefix.size())) == scpi::upperCased(prefix);
 }
 
-// Numbers in replies as the analyzer writes them (NR3, 12 significant digits).
-std::string nr3(double value) {
-    char buffer[40];
-    std::snprintf(buffer, sizeof buffer, "%+.11E", value);
-    return buffer;
-}
-
-std::string inQuotes(const std::string& text) {
-    return "\"" + text + "\"";
-}
-
-int integerIn(double value, int low, int high) {
-    if (!(value >= low && value <= high) || std::floor(value) != value) {
-        throw scpi::Error{-222, "Data out of range"};
-    }
-    return static_cast<int>(value);
+bool rootedHeader(std::string_view unit) {
+    std::size_t i = unit.find_first_not_of(" \t\r\n");
+    return i != std::string_view::npos && unit[i] == ':';
 }
 
 }  // namespace
 
-std::string Instrument::parse(unsigned generation, const std::string& command) {
-    std::lock_guard lock(m_mutex);
-    m_transcript.record('>', command);
+std::string Instrument::parse(unsigned generation, std::string_view message) {
+    std::unique_lock lock(m_mutex);
+    HeldLock held(*this, lock);
+    m_transcript.record('>', message);
     checkGeneration(generation, "SCPI parse");
+    return runMessage(message);
+}
+
+std::string Instrument::execute(std::string_view message) {
+    std::unique_lock lock(m_mutex);
+    HeldLock held(*this, lock);
+    m_transcript.record('>', message);
+    return runMessage(message);
+}
+
+std::uint8_t Instrument::statusByte(bool messageAvailable) {
+    std::lock_guard lock(m_mutex);
+    return m_status.statusByte(!m_errors.empty(), messageAvailable);
+}
+
+void Instrument::reportError(int code, const std::string& message) {
+    std::lock_guard lock(m_mutex);
+    queueError(code, message);
+}
+
+std::string Instrument::runMessage(std::string_view message) {
     std::string reply;
     bool first = true;
-    for (std::string_view unit : scpi::splitMessageUnits(command)) {
-        std::string part = executeUnit(unit);
+    std::vector<std::string> path;
+    for (std::string_view unit : scpi::splitMessageUnits(message)) {
+        std::string part;
+        try {
+            scpi::CommandHeader header = scpi::parseHeader(unit);
+            scpi::ParameterReader parameters(header.parameters);
+            part = m_commands.dispatch(header, rootedHeader(unit), path, parameters);
+            parameters.finish();
+        } catch (const scpi::Error& error) {
+            queueError(error.code, error.message);
+            part.clear();
+        }
         applyErrorRules(unit);
         if (!part.empty()) {
             reply += first ? "" : ";";
@@ -67,18 +75,10 @@ std::string Instrument::parse(unsigned generation, const std::string& command) {
     return reply;
 }
 
-std::string Instrument::executeUnit(std::string_view unit) {
-    try {
-        scpi::CommandHeader header = scpi::parseHeader(unit);
-        scpi::ParameterReader parameters(header.parameters);
-        std::string reply = m_commands.dispatch(header, parameters);
-        parameters.finish();
-        return reply;
-    } catch (const scpi::Error& error) {
-        m_errors.push(error.code, error.message);
-        m_transcript.record('!', std::to_string(error.code) + ",\"" + error.message + "\"");
-        return "";
-    }
+void Instrument::queueError(int code, const std::string& message) {
+    m_errors.push(code, message);
+    m_status.recordError(code);
+    m_transcript.record('!', std::to_string(code) + ",\"" + message + "\"");
 }
 
 void Instrument::applyErrorRules(std::string_view unit) {
@@ -88,6 +88,7 @@ void Instrument::applyErrorRules(std::string_view unit) {
             ++m_errorRuleUses[i];
             for (const auto& error : rules[i].errors) {
                 m_errors.pushText(error);
+                m_status.recordError(std::atoi(error.c_str()));
                 m_transcript.record('!', error);
             }
         }
@@ -95,27 +96,17 @@ void Instrument::applyErrorRules(std::string_view unit) {
 }
 
 void Instrument::buildCommands() {
+    addCommonCommands();
+    addChannelCommands();
+    addMeasurementCommands();
+    addFileCommands();
+    addDiagnosticCommands();
+}
+
+void Instrument::addDiagnosticCommands() {
     auto& t = m_commands;
     using C = scpi::CommandContext;
 
-    // Identification and status.
-    t.add("*IDN?", [this](C&) { return m_scenario.idn; });
-    t.add("*OPT?", [this](C&) { return inQuotes(m_scenario.options); });
-    t.add("*RST", [this](C&) {
-        preset();
-        return std::string();
-    });
-    t.add("*CLS", [this](C&) {
-        m_errors.clear();
-        return std::string();
-    });
-    t.add("*OPC?", [](C&) { return std::string("1"); });
-    t.add("SYSTem:ERRor:[NEXT]?", [this](C&) { return m_errors.pop(); });
-    t.add("SYSTem:ERRor:COUNt?", [this](C&) { return std::to_string(m_errors.size()); });
-    t.add("SYSTem:PRESet", [this](C&) {
-        preset();
-        return std::string();
-    });
     t.add("SYSTem:CONFigure:MWAVe:CONFiguration:CATalog?",
           [this](C&) { return inQuotes(m_scenario.mmwaveCatalog); });
     t.add("SYSTem:CONFigure:MWAVe:CONFiguration:ACTive?",
@@ -132,234 +123,10 @@ void Instrument::buildCommands() {
     });
     t.add("DIAGnostic:PORTCOUNT?", [this](C&) { return std::to_string(m_scenario.portCount); });
 
-    // Source power of a port: SOUR:POW <dBm>[,"PORT n"].
-    auto portOf = [this](C& c) {
-        int port = 1;
-        if (!c.parameters.atEnd()) {
-            std::string text = c.parameters.string();
-            std::string digits = parsePortText(text);
-            if (digits.empty() || digits.size() > 2 ||
-                platform::upperCased(text).find("PORT") == std::string::npos) {
-                throw scpi::Error{-224, "Illegal parameter value; no source port \"" + text + "\""};
-            }
-            port = std::stoi(digits);
-        }
-        if (port < 1 || port > m_scenario.portCount) {
-            throw scpi::Error{-222, "Data out of range; port " + std::to_string(port)};
-        }
-        return port;
-    };
-    t.add("SOURce#:POWer#:[LEVel]:[IMMediate]:[AMPLitude]", [this, portOf](C& c) {
-        double power = c.parameters.number();
-        int port = portOf(c);
-        if (power < -90.0 || power > 20.0) {
-            throw scpi::Error{-222, "Data out of range; source power -90 to 20 dBm"};
-        }
-        // Port powers are coupled, as after a preset: one level for every port.
-        if (m_powerCoupled) {
-            for (int p = 1; p <= m_scenario.portCount; ++p) {
-                m_sourcePower[p] = power;
-            }
-        } else {
-            m_sourcePower[port] = power;
-        }
-        return std::string();
-    });
-    t.add("SOURce#:POWer#:COUPle", [this](C& c) {
-        m_powerCoupled = c.parameters.boolean();
-        return std::string();
-    });
-    t.add("SOURce#:POWer#:COUPle?", [this](C&) { return std::string(m_powerCoupled ? "1" : "0"); });
-    t.add("SOURce#:POWer#:[LEVel]:[IMMediate]:[AMPLitude]?",
-          [this, portOf](C& c) { return nr3(sourcePowerDbm(portOf(c))); });
-
-    // Measurements.
-    t.add("CALCulate#:PARameter:DELete", [this](C& c) {
-        deleteMeasurement(c.parameters.string());
-        return std::string();
-    });
-    t.add("CALCulate#:PARameter:DELete:ALL", [this](C&) {
-        m_measurements.clear();
-        m_traceFeeds.clear();
-        m_selectedId = 0;
-        return std::string();
-    });
-    t.add("CALCulate#:PARameter:DEFine:EXTended", [this](C& c) {
-        std::string name = c.parameters.string();
-        std::string parameter = c.parameters.string();
-        defineMeasurement(name, parameter);
-        return std::string();
-    });
-    t.add("CALCulate#:PARameter:SELect", [this](C& c) {
-        m_selectedId = measurementNamed(c.parameters.string()).id;
-        return std::string();
-    });
-    t.add("CALCulate#:PARameter:SELect?", [this](C&) {
-        MeasurementState* m = selectedMeasurement();
-        return inQuotes(m ? m->name : "");
-    });
-    t.add("CALCulate#:PARameter:CATalog:[EXTended]?", [this](C&) {
-        std::string list;
-        for (const auto& m : m_measurements) {
-            list += (list.empty() ? "" : ",") + m.name + "," + m.parameter;
-        }
-        return inQuotes(list);
-    });
-    auto selected = [this]() -> MeasurementState& {
-        MeasurementState* m = selectedMeasurement();
-        if (!m) {
-            throw scpi::Error{-221, "Settings conflict; no measurement selected"};
-        }
-        return *m;
-    };
-    t.add("CALCulate#:FUNCtion:STATe", [this](C& c) {
-        m_statistics = c.parameters.boolean();
-        return std::string();
-    });
-    t.add("CALCulate#:FUNCtion:STATe?",
-          [this](C&) { return std::string(m_statistics ? "1" : "0"); });
-    t.add("CALCulate#:FUNCtion:TYPE", [this](C& c) {
-        std::string type = c.parameters.word();
-        if (type != "MEAN" && type != "PTP" && type != "STDEV" && type != "MIN" && type != "MAX") {
-            throw scpi::Error{-224, "Illegal parameter value; statistic " + type};
-        }
-        m_statisticsType = type;
-        return std::string();
-    });
-    t.add("CALCulate#:FUNCtion:DATA?", [this, selected](C&) {
-        MeasurementState& m = selected();
-        long points = static_cast<long>(m.mag.size());
-        std::vector<float> trace(m.mag.size());
-        if (readTrace(m.id, 2, 1, points, trace) != 0 || points == 0) {
-            throw scpi::Error{-230, "Data corrupt or stale; no trace data"};
-        }
-        trace.resize(static_cast<std::size_t>(points));
-        double sum = std::accumulate(trace.begin(), trace.end(), 0.0);
-        double mean = sum / static_cast<double>(trace.size());
-        double result = mean;
-        if (m_statisticsType == "MIN" || m_statisticsType == "MAX" || m_statisticsType == "PTP") {
-            auto [low, high] = std::minmax_element(trace.begin(), trace.end());
-            result = m_statisticsType == "MIN"   ? *low
-                     : m_statisticsType == "MAX" ? *high
-                                                 : *high - *low;
-        } else if (m_statisticsType == "STDEV") {
-            double square = 0.0;
-            for (float v : trace) {
-                square += (v - mean) * (v - mean);
-            }
-            result = std::sqrt(square / static_cast<double>(trace.size()));
-        }
-        return nr3(result);
-    });
-    t.add("CALCulate#:MATH:MEMorize", [selected](C&) {
-        MeasurementState& m = selected();
-        if (!m.hasData) {
-            throw scpi::Error{-200, "Execution error; no data to memorize"};
-        }
-        m.memMag = m.mag;
-        m.memPhase = m.phase;
-        return std::string();
-    });
-    t.add("CALCulate#:MATH:FUNCtion", [selected](C& c) {
-        std::string function = c.parameters.word();
-        MeasurementState& m = selected();
-        if (function == "DIV" || function == "DIVIDE") {
-            if (m.memMag.empty()) {
-                throw scpi::Error{-221, "Settings conflict; no memory trace"};
-            }
-            m.divide = true;
-        } else if (function == "NORM" || function == "NORMAL") {
-            m.divide = false;
-        } else {
-            throw scpi::Error{-224, "Illegal parameter value; math function " + function};
-        }
-        return std::string();
-    });
-    t.add("CALCulate#:MATH:FUNCtion?",
-          [selected](C&) { return std::string(selected().divide ? "DIV" : "NORM"); });
-
-    // Display.
-    t.add("DISPlay:WINDow#:TRACe#:FEED", [this](C& c) {
-        std::string name = c.parameters.string();
-        measurementNamed(name);
-        m_traceFeeds[{c.suffix(0), c.suffix(1)}] = name;
-        return std::string();
-    });
-    t.add("DISPlay:WINDow#:TRACe#:SELect", [this](C& c) {
-        auto feed = m_traceFeeds.find({c.suffix(0), c.suffix(1)});
-        if (feed == m_traceFeeds.end()) {
-            throw scpi::Error{-221, "Settings conflict; trace " + std::to_string(c.suffix(1)) +
-                                        " shows no measurement"};
-        }
-        m_selectedId = measurementNamed(feed->second).id;
-        return std::string();
-    });
-    t.add("DISPlay:WINDow#:TRACe#:STATe", [](C& c) {
-        c.parameters.boolean();
-        return std::string();
-    });
-    t.add("DISPlay:WINDow#:TRACe#:Y:[SCALe]:PDIVision", [this](C& c) {
-        double scale = c.parameters.number();
-        if (scale <= 0.0) {
-            throw scpi::Error{-222, "Data out of range; scale per division"};
-        }
-        m_traceScale[{c.suffix(0), c.suffix(1)}] = scale;
-        return std::string();
-    });
-    t.add("DISPlay:WINDow#:TRACe#:Y:[SCALe]:PDIVision?", [this](C& c) {
-        auto it = m_traceScale.find({c.suffix(0), c.suffix(1)});
-        return nr3(it == m_traceScale.end() ? 10.0 : it->second);
-    });
-
-    // Averaging, sweep options, data format.
-    t.add("SENSe#:AVERage:[STATe]", [this](C& c) {
-        bool on = c.parameters.boolean();
-        if (on != m_channel.averaging) {
-            for (auto& m : m_measurements) {
-                m.averaged = 0;
-            }
-        }
-        m_channel.averaging = on;
-        return std::string();
-    });
-    t.add("SENSe#:AVERage:[STATe]?",
-          [this](C&) { return std::string(m_channel.averaging ? "1" : "0"); });
-    t.add("SENSe#:AVERage:CLEar", [this](C&) {
-        for (auto& m : m_measurements) {
-            m.averaged = 0;
-        }
-        return std::string();
-    });
-    t.add("SENSe#:AVERage:COUNt", [this](C& c) {
-        m_channel.averageCount = integerIn(c.parameters.number(), 1, 65536);
-        return std::string();
-    });
-    t.add("SENSe#:AVERage:COUNt?", [this](C&) { return std::to_string(m_channel.averageCount); });
-    t.add("SENSe#:SWEep:LFEXtension:STATe", [this](C& c) {
-        m_lowFrequencyExtension = c.parameters.boolean();
-        return std::string();
-    });
-    t.add("SENSe#:SWEep:LFEXtension:STATe?",
-          [this](C&) { return std::string(m_lowFrequencyExtension ? "1" : "0"); });
-    t.add("SENSe#:SWEep:POINts?", [this](C&) { return std::to_string(sweepPoints()); });
-    t.add("FORMat:[DATA]", [this](C& c) {
-        std::string format = c.parameters.word();
-        if (format != "ASC" && format != "ASCII" && format != "REAL") {
-            throw scpi::Error{-224, "Illegal parameter value; data format " + format};
-        }
-        if (!c.parameters.atEnd()) {
-            c.parameters.number();
-        }
-        m_dataFormat = format == "ASCII" ? "ASC" : format;
-        return std::string();
-    });
-    t.add("FORMat:[DATA]?",
-          [this](C&) { return m_dataFormat + (m_dataFormat == "ASC" ? ",0" : ",32"); });
-
     // Receiver paths.
     t.add("SENSe#:PATH:CONFig:ELEMent:[STATe]", [this](C& c) {
-        std::string element = platform::upperCased(c.parameters.string());
-        std::string value = platform::upperCased(c.parameters.string());
+        std::string element = scpi::upperCased(c.parameters.string());
+        std::string value = scpi::upperCased(c.parameters.string());
         if (element.empty() || value.empty()) {
             throw scpi::Error{-224, "Illegal parameter value; empty path element"};
         }
@@ -370,7 +137,7 @@ void Instrument::buildCommands() {
         return std::string();
     });
     t.add("SENSe#:PATH:CONFig:ELEMent:[STATe]?", [this](C& c) {
-        std::string element = platform::upperCased(c.parameters.string());
+        std::string element = scpi::upperCased(c.parameters.string());
         if (element.rfind("NBFATN", 0) == 0 && m_scenario.hasReceiver(element.substr(6))) {
             auto fault = m_scenario.faults.attenuatorReply.find(element.substr(6));
             return fault == m_scenario.faults.attenuatorReply.end() ? inQuotes("30")
@@ -395,7 +162,7 @@ void Instrument::buildCommands() {
     }
     t.add("DIAGnostic:SWEEP_PARM", [](C& c) {
         c.parameters.string();
-        std::string value = platform::upperCased(c.parameters.string());
+        std::string value = scpi::upperCased(c.parameters.string());
         if (value != "TRUE" && value != "FALSE") {
             throw scpi::Error{-224, "Illegal parameter value; \"" + value + "\""};
         }

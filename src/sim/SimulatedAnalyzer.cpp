@@ -3,6 +3,7 @@
 #include "analyzer/automation/BackendFactory.h"
 #include "sim/AutomationObjects.h"
 #include "sim/Instrument.h"
+#include "sim/ScpiDevice.h"
 
 namespace sim {
 
@@ -15,6 +16,10 @@ SimulatedAnalyzer::~SimulatedAnalyzer() = default;
 
 std::shared_ptr<automation::Object> SimulatedAnalyzer::application() {
     return makeApplicationObject(m_instrument);
+}
+
+std::unique_ptr<scpi::Device> SimulatedAnalyzer::scpiDevice() {
+    return makeScpiDevice(m_instrument);
 }
 
 void SimulatedAnalyzer::registerAsBackend() {

@@ -11,6 +11,7 @@
 
 #include "analyzer/automation/Automation.h"
 #include "platform/Clock.h"
+#include "scpi/Device.h"
 #include "sim/Scenario.h"
 
 namespace sim {
@@ -28,6 +29,8 @@ class SimulatedAnalyzer {
 
     // A fresh Application object of the running application.
     std::shared_ptr<automation::Object> application();
+    // The instrument as a network transport serves it.
+    std::unique_ptr<scpi::Device> scpiDevice();
     // Registers this instrument under "sim" with the automation back-end factory (and as
     // its default); the factory keeps the instrument alive.
     void registerAsBackend();

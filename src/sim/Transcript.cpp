@@ -2,12 +2,12 @@
 
 namespace sim {
 
-void Transcript::record(char kind, const std::string& text) {
+void Transcript::record(char kind, std::string_view text) {
     std::string line;
     line += kind;
     line += ' ';
     if (text.size() > maxLineLength) {
-        line.append(text, 0, maxLineLength);
+        line.append(text.substr(0, maxLineLength));
         line += "... [" + std::to_string(text.size()) + " characters]";
     } else {
         line += text;

@@ -9,6 +9,7 @@
 #include <fstream>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace sim {
@@ -17,7 +18,7 @@ class Transcript {
   public:
     static constexpr std::size_t maxLineLength = 4000;
 
-    void record(char kind, const std::string& text);
+    void record(char kind, std::string_view text);
     std::vector<std::string> lines() const;
     void clear();
     // Appends every later line to the file; raises an error text when it cannot be opened.
