@@ -163,3 +163,15 @@ TEST_F(ThreadedRawSocket, ClientLeavingMidResponseDisturbsNoOther) {
     other.send("*IDN?\n");
     EXPECT_EQ(other.line(5s), "FAKE,LAN-TEST,0,1.0");
 }
+
+TEST_F(ThreadedRawSocket, StopClosesEveryConnection) {
+    TestSocket idle = connect();
+    TestSocket busy = connect();
+    busy.send("*IDN?\n");
+    busy.line();
+    const std::uint16_t port = server.port();
+    context.stop();
+    EXPECT_TRUE(idle.closedWithin(1s));
+    EXPECT_TRUE(busy.closedWithin(1s));
+    EXPECT_THROW(TestSocket{port}, std::runtime_error);
+}
