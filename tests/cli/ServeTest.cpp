@@ -136,8 +136,8 @@ TEST(ThreadedServe, PyvisaAndLxiDriveTheRawSocket) {
     EXPECT_EQ(testsupport::readFile(dir / "state" / "C" / "pyvisa.bin").size(), 256u * 40 + 5);
 }
 
-// VXI-11 clients look for the portmapper on port 111, so server and clients run in a network
-// namespace that this test makes, with only loopback in it.
+// VXI-11 clients look for the portmapper on port 111, and discovery broadcasts, so server and
+// clients run in a network namespace that this test makes, with only loopback in it.
 TEST(ThreadedServe, PyvisaAndLxiDriveVxi11ThroughThePortmapper) {
     TempDir dir;
     testsupport::writeFile(
@@ -154,6 +154,7 @@ TEST(ThreadedServe, PyvisaAndLxiDriveVxi11ThroughThePortmapper) {
             "TCPIP::127.0.0.1::inst0::INSTR\n"
             "status=$?\n"
             "timeout 30 lxi scpi -a 127.0.0.1 '*IDN?' > lxi.txt 2>&1 || status=91\n"
+            "timeout 30 lxi discover -t 2 > discover.txt 2>&1 || status=93\n"
             "kill -TERM $server; wait $server || status=92\n"
             "exit $status\n");
     const std::string output =
@@ -165,6 +166,12 @@ TEST(ThreadedServe, PyvisaAndLxiDriveVxi11ThroughThePortmapper) {
     const std::string idn = testsupport::readFile(dir / "lxi.txt");
     EXPECT_GT(idn.size(), 1u) << idn;
     EXPECT_EQ(idn.find("rror"), std::string::npos) << idn;
+    // Broadcast discovery asks the portmapper over UDP, then the instrument for *IDN?.
+    const std::string discovered = testsupport::readFile(dir / "discover.txt");
+    EXPECT_NE(
+        discovered.find("Found \"" + idn.substr(0, idn.find('\n')) + "\" on address 127.0.0.1"),
+        std::string::npos)
+        << discovered;
 }
 
 TEST(Serve, TakenPortOrBadAddressIsAClearError) {
