@@ -7,7 +7,6 @@
 #include "lan/OncRpc.h"
 #include "lan/RecordMarking.h"
 
-using lantest::callRecord;
 using lantest::words;
 using testsupport::errorOf;
 
@@ -80,40 +79,6 @@ TEST(RpcCodec, RecordOverTheLimitFailsBeforeItsBytesArrive) {
     lan::RecordReader fresh(1000);
     EXPECT_EQ(errorOf([&] { fresh.feed(mark(0xFFFFFFFFu)); }),
               "RPC record of more than 2147483647 bytes exceeds the limit of 1000");
-}
-
-TEST(RpcCodec, CallsAndRepliesRoundTrip) {
-    const std::string record = callRecord(42, 100000, 2, 3, words({0x0607AF, 1, 6, 0}));
-    lan::RecordReader reader(1000);
-    reader.feed(record);
-    ASSERT_TRUE(reader.complete());
-    lan::XdrReader call(reader.record());
-    const lan::rpc::Call header = lan::rpc::readCall(call);
-    EXPECT_EQ(header.xid, 42u);
-    EXPECT_EQ(header.program, 100000u);
-    EXPECT_EQ(header.version, 2u);
-    EXPECT_EQ(header.procedure, 3u);
-    EXPECT_EQ(call.u32("program"), 0x0607AFu);
-
-    std::string reply = lan::rpc::beginReply(42, lan::rpc::AcceptStat::Success);
-    lan::XdrWriter(reply).u32(1234);
-    lan::XdrReader replyReader(std::string_view(reply).substr(4));
-    lan::rpc::readReply(replyReader, 42);
-    EXPECT_EQ(replyReader.u32("port"), 1234u);
-
-    const std::string refused =
-        lan::rpc::beginReply(9, lan::rpc::AcceptStat::ProgramMismatch, 1).substr(4);
-    EXPECT_EQ(errorOf([&] {
-                  lan::XdrReader r(refused);
-                  lan::rpc::readReply(r, 9);
-              }),
-              "RPC call not accepted (accept status 2)");
-    const std::string notCall = words({1, 1, 2});
-    EXPECT_EQ(errorOf([&] {
-                  lan::XdrReader r(notCall);
-                  lan::rpc::readCall(r);
-              }),
-              "RPC message type 1 is not a call");
 }
 
 TEST(RpcCodec, RandomBytesRaiseOnlyProtocolErrors) {

@@ -63,6 +63,16 @@ def main(resource):
     )
     expect("file read back", back, payload)
     expect("errors at the end", analyzer.query("SYST:ERR?"), '0,"No error"')
+
+    if resource.endswith("INSTR"):
+        analyzer.write("*IDN?")
+        analyzer.clear()  # device clear drops the unread response
+        if analyzer.read_stb() & 0x10:
+            sys.exit("message available after a device clear")
+        analyzer.lock_excl()
+        if not analyzer.query("*IDN?").strip():
+            sys.exit("*IDN? while locked: empty")
+        analyzer.unlock()
     analyzer.close()
     print("pyvisa serve client passed")
 
