@@ -64,6 +64,7 @@ struct DialogOptions {
     std::string answers;
     bool yes = false;
     bool gui = false;
+    int maxRetries = 3;
 };
 
 int runDialog(const DialogOptions& options) {
@@ -106,7 +107,8 @@ int runDialog(const DialogOptions& options) {
     };
     int status = 0;
     if (scripted) {
-        status = console::runScripted(setup, script, std::move(*answers), std::cout, std::cerr);
+        status = console::runScripted(setup, script, std::move(*answers), std::cout, std::cerr,
+                                      options.maxRetries);
     } else {
         std::signal(SIGINT, onInterrupt);
         console::FdLineSource input(STDIN_FILENO);
@@ -138,6 +140,11 @@ const cli::CommandRegistration registration{
         app.add_flag("--yes", options->yes,
                      "Answer every box with Yes or OK and the bad-data dialog with Continue")
             ->excludes(answers);
+        app.add_option("--max-retries", options->maxRetries,
+                       "Unattended runs: how often one receiver's failed step is repeated "
+                       "(Retry? answered Yes, bad data Retest) before No or Quit is answered")
+            ->check(CLI::Range(0, 1000))
+            ->capture_default_str();
         app.add_flag("--gui", options->gui,
                      "Open the dialog in a desktop window instead of the terminal (needs a "
                      "display), e.g. rcvrchar --gui --workdir bench");

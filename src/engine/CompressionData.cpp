@@ -67,6 +67,18 @@ float wrapPhase(float degrees) {
     return x;
 }
 
+bool CCompressionData::readingsFinite(int f) const {
+    const auto column = static_cast<std::size_t>(f);
+    for (const Table* table : {&m_testMag, &m_ratioMag, &m_phase}) {
+        for (const auto& level : *table) {
+            if (column < level.size() && !std::isfinite(level[column])) {
+                return false;
+            }
+        }
+    }
+    return true;
+}
+
 bool CCompressionData::findCompressionPoint(float level, float tolerance, int f, bool first,
                                             int& startIndex, bool& stop) {
     const float L = level;

@@ -41,6 +41,7 @@ class CCompressionData final : public storage::MeasuredResults {
     void writeAllMeasuredData(const std::string& tag, const std::filesystem::path& directory) const;
     static std::string measuredDataFileName(const std::string& tag);
 
+    bool readingsFinite(int f) const override;
     // Searches the power levels at frequency index f for compression level L dB.
     bool findCompressionPoint(float level, float tolerance, int f, bool first, int& startIndex,
                               bool& stop) override;

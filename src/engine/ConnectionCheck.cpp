@@ -124,7 +124,7 @@ void checkConnection(SweepContext& context, const std::string& label, const std:
         const Answer retry = context.ui.messageBox(
             {"Receiver " + label + " In does not seem to be connected to source Port " + port +
                  "\nPlease check connection\nRetry? (no will continue)",
-             "Check Connection", Buttons::YesNo, platform::BoxTopmost});
+             "Check Connection", Buttons::YesNo, platform::BoxTopmost, label + " connection"});
         if (retry != Answer::Yes) {
             break;
         }
@@ -182,7 +182,7 @@ void checkConnection(SweepContext& context, const std::string& label, const std:
 }
 
 void checkPowerRatio(SweepContext& context, const std::string& model, long points,
-                     const Instructions& instructions) {
+                     const Instructions& instructions, const std::string& label) {
     CNetworkAnalyzer& proxy = context.proxy;
     proxy.sendscpi("CALC:PAR:SEL \"measratio\"");
     proxy.sendscpi("DISP:WIND:TRACE2:SEL");
@@ -213,7 +213,7 @@ void checkPowerRatio(SweepContext& context, const std::string& model, long point
             "Check connections, connection instructions were: \n\n" + instructions.text +
             "\n\nRetry? (no will continue)";
         if (context.ui.messageBox({text, "Unexpected power ratio reading", Buttons::YesNo,
-                                   platform::BoxTopmost}) != Answer::Yes) {
+                                   platform::BoxTopmost, label + " power ratio"}) != Answer::Yes) {
             return;
         }
     }

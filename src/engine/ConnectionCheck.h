@@ -40,8 +40,9 @@ void showInstructions(SweepContext& context, const InstructionInputs& inputs,
 void checkConnection(SweepContext& context, const std::string& label, const std::string& port,
                      bool settle);
 
-// Port mode: the ratio trace must read the pad the operator was told to fit.
+// Port mode: the ratio trace of receiver `label` must read the pad the operator was told to
+// fit.
 void checkPowerRatio(SweepContext& context, const std::string& model, long points,
-                     const Instructions& instructions);
+                     const Instructions& instructions, const std::string& label);
 
 }  // namespace engine

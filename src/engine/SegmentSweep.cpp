@@ -126,7 +126,8 @@ bool prepareSegment(SweepContext& context, double referencePower, const std::str
     proxy.sweep(false);
     const auto buffer = pointBuffer(proxy);
     if (inputs.portMode) {
-        checkPowerRatio(context, model, static_cast<long>(buffer.size()), instructions);
+        checkPowerRatio(context, model, static_cast<long>(buffer.size()), instructions,
+                        inputs.label);
     }
 
     proxy.sweep(false);

@@ -5,6 +5,7 @@
 // block the dialog.
 
 #include <string>
+#include <utility>
 
 namespace platform {
 
@@ -21,10 +22,22 @@ enum BoxFlags : unsigned {
 };
 
 struct MessageBox {
+    MessageBox() = default;
+    MessageBox(std::string text, std::string caption, Buttons buttons = Buttons::Ok,
+               unsigned flags = BoxNone, std::string retryOf = {})
+        : text(std::move(text)),
+          caption(std::move(caption)),
+          buttons(buttons),
+          flags(flags),
+          retryOf(std::move(retryOf)) {}
+
     std::string text;
     std::string caption;
     Buttons buttons = Buttons::Ok;
     unsigned flags = BoxNone;
+    // On a question whose Yes repeats a failed step: the receiver and the step ("R2
+    // connection"), so that an unattended operator can stop retrying. Empty otherwise.
+    std::string retryOf;
 };
 
 // The three ways out of the bad-data dialog; closing it counts as Continue.

@@ -18,8 +18,10 @@ platform::Answer SimulatedBench::messageBox(const platform::MessageBox& box) {
             instrument.cableReceivers(cables);
         }
     } else if (box.caption == "Check Connection" && answer == platform::Answer::Yes) {
+        // Checking the connection, the operator also makes sure the instructed pad is fitted.
         if (auto receiver = receiverOfConnectionComplaint(box.text)) {
             instrument.operatorRecheckedConnection(*receiver);
+            instrument.operatorRecheckedPad(*receiver);
         }
     } else if (box.caption == "Unexpected power ratio reading" && answer == platform::Answer::Yes) {
         for (const auto& cable : readConnectionInstructions(box.text)) {

@@ -22,6 +22,8 @@ class MeasuredResults {
     virtual double getMaxMeasuredFrequency() const = 0;
     virtual float getMinCompStepRatio() const = 0;
 
+    // Whether every reading at frequency index f, at every power level, is a finite number.
+    virtual bool readingsFinite(int f) const = 0;
     // Searches the power levels at frequency index f for compression level L dB; the
     // outputs below hold what it found.
     virtual bool findCompressionPoint(float level, float tolerance, int f, bool first,

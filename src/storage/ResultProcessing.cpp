@@ -227,7 +227,9 @@ Judgement buildImage(MeasuredResults& store, const std::string& name, bool mmwav
             if (raw.on()) {
                 writeRawLine(raw, frequency, points);
             }
-            const int failures = failingPairs(points, last, ratio);
+            // A reading that is not a number (a failed trace read) can never pass.
+            const int failures = failingPairs(points, last, ratio) +
+                                 (store.readingsFinite(static_cast<int>(i)) ? 0 : 1);
             if (failures > 0) {
                 result.passed = false;
                 for (int n = 0; raw.on() && n < failures; ++n) {

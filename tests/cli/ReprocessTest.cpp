@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cmath>
 #include <cstdio>
 #include <nlohmann/json.hpp>
@@ -114,4 +115,41 @@ TEST(ReprocessCommand, ErrorsGoToStderrWithStatusOne) {
         dir, "reprocess --csv in.csv --receiver A --model T3871B --out . --file missing.dat");
     EXPECT_EQ(noFile.status, 1);
     EXPECT_NE(noFile.err.find("missing.dat"), std::string::npos) << noFile.err;
+}
+
+// A reading that is not a finite number (a run writes one when a trace read fails) fails the
+// criteria at its frequency: a result built on it never passes.
+TEST(ReprocessCommand, NonFiniteReadingsFailTheCriteriaAtTheirFrequency) {
+    testsupport::TempDir dir;
+    const std::string healthy = measuredCsv(dir, -8);
+    const std::string header = healthy.substr(0, healthy.find('\n'));
+    const auto readings = static_cast<std::size_t>(std::count(header.begin(), header.end(), ','));
+    for (const std::string bad : {"nan", "-inf"}) {
+        SCOPED_TRACE(bad);
+        // The fourth frequency reads `bad` at every level.
+        std::string csv;
+        std::size_t start = 0;
+        for (int line = 0; start < healthy.size(); ++line) {
+            const std::size_t end = healthy.find('\n', start);
+            std::string text = healthy.substr(start, end - start);
+            if (line == 4) {
+                text = text.substr(0, text.find(','));
+                for (std::size_t c = 0; c < readings; ++c) {
+                    text += "," + bad;
+                }
+            }
+            csv += text + "\n";
+            start = end + 1;
+        }
+        testsupport::writeFile(dir / "in.csv", csv);
+        const CommandRun result = runRcvrchar(dir, kArguments + quotedSample());
+        EXPECT_EQ(result.status, 2) << result.err;
+        const std::string raw = testsupport::readFile(dir / "rcvrCharRaw_A.txt");
+        std::size_t failed = 0;
+        for (auto at = raw.find("FAILED"); at != std::string::npos;
+             at = raw.find("FAILED", at + 1)) {
+            ++failed;
+        }
+        EXPECT_GE(failed, 1u);
+    }
 }

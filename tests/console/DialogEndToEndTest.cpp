@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <filesystem>
+
 #include "app/CTarvexApp.h"
 
 #include "ConsoleRun.h"
@@ -315,4 +317,43 @@ TEST(ThreadedDialogEndToEnd, FlashThatDoesNotReadBackAsWrittenFailsTheRun) {
                              "); it is not counted as stored. => OK\n", "Error in Cal\n"}))
         << run.out();
     EXPECT_FALSE(run.has("Cal Complete"));
+}
+
+// Unattended, a failed step is repeated at most --max-retries times per receiver; then the
+// answer that stops repeating is given: No to a retry question, Quit for bad data (never
+// a defaulted characterization of known-bad data).
+TEST(ThreadedDialogUnattended, RetriesAreBoundedPerReceiverAndStep) {
+    {
+        ConsoleRun run(R"({"options": "010,080", "faults": {"disconnected": {"R1": 50}}})");
+        ASSERT_EQ(run.runYes("clear\nselect R1\nrun\nwait\n"), 0) << run.err();
+        const std::string retry = "[Check Connection] Receiver R1 In does not seem";
+        EXPECT_TRUE(
+            run.inOrder({retry, "=> Yes\n", retry, "=> Yes\n", retry, "=> Yes\n", retry, "=> No\n",
+                         "Unattended: R1 connection already repeated 3 times "
+                         "(--max-retries), answered No\n"}))
+            << run.out();
+    }
+    {
+        ConsoleRun run(R"({"options": "010,080", "faults": {"bad_data": {"R1": 50}}})");
+        ASSERT_EQ(run.run("clear\nselect R1\nrun\nwait\n",
+                          kOperator + "Characterization data issue! = Retest\nPlease Note = OK\n"
+                                      "Error = OK\n"),
+                  app::CTarvexApp::exitRunFailed)
+            << run.err();
+        EXPECT_TRUE(run.inOrder({"Retest\n", "Retest\n", "Retest\n", "=> Quit\n",
+                                 "Unattended: R1 data already repeated 3 times", "Error in Cal\n"}))
+            << run.out();
+        EXPECT_FALSE(run.has("Cal Complete"));
+    }
+}
+
+// --yes with every shipped scenario ends by itself.
+TEST(ThreadedDialogUnattended, EveryShippedScenarioEndsUnderYes) {
+    for (const auto& entry : std::filesystem::directory_iterator(
+             std::filesystem::path(RCVRCHAR_SOURCE_DIR) / "data" / "scenarios")) {
+        SCOPED_TRACE(entry.path().filename().string());
+        ConsoleRun run(ConsoleRun::scenarioFile(entry.path().filename().string()));
+        EXPECT_EQ(run.runYes("selectall\nrun\nwait\n"), 0) << run.err();
+        EXPECT_TRUE(run.has("Cal Complete")) << run.out();
+    }
 }

@@ -5,6 +5,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "frontends/console/AnswerBook.h"
@@ -12,9 +13,24 @@
 namespace console {
 
 struct BoxQuestion {
+    BoxQuestion(std::string caption, std::string text, std::vector<AnswerWord> allowed,
+                std::string retryOf = {}, AnswerWord retryWord = AnswerWord::Yes,
+                AnswerWord stopWord = AnswerWord::No)
+        : caption(std::move(caption)),
+          text(std::move(text)),
+          allowed(std::move(allowed)),
+          retryOf(std::move(retryOf)),
+          retryWord(retryWord),
+          stopWord(stopWord) {}
+
     std::string caption;
     std::string text;
     std::vector<AnswerWord> allowed;
+    // A question that repeats a failed step: the receiver and step, the answer that repeats
+    // it and the one that stops repeating.
+    std::string retryOf;
+    AnswerWord retryWord;
+    AnswerWord stopWord;
 };
 
 class BoxAnswerer {

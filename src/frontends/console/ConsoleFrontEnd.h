@@ -38,8 +38,10 @@ struct ConsoleSetup {
     std::function<std::shared_ptr<platform::OperatorUi>(platform::OperatorUi& console)> wrapUi;
 };
 
+// A retry question is answered Yes (bad data: Retest) at most maxRetries times for one
+// receiver and step; then No (Quit).
 int runScripted(ConsoleSetup& setup, const std::vector<ScriptLine>& script, AnswerBook answers,
-                std::ostream& out, std::ostream& err);
+                std::ostream& out, std::ostream& err, int maxRetries = 3);
 
 // closeRequested (set by Ctrl-C) is read and cleared by the loop: it presses Close.
 int runInteractive(ConsoleSetup& setup, LineSource& input, std::ostream& out, std::ostream& err,

@@ -55,14 +55,19 @@ AnswerWord ConsoleOperatorUi::ask(const BoxQuestion& question) {
 }
 
 platform::Answer ConsoleOperatorUi::messageBox(const platform::MessageBox& box) {
-    return toAnswer(ask({box.caption, box.text, wordsFor(box.buttons)}));
+    return toAnswer(ask({box.caption, box.text, wordsFor(box.buttons), box.retryOf}));
 }
 
 platform::BadDataChoice ConsoleOperatorUi::badDataChoice(const std::string& receiver) {
     app::RcvrCharBadDlg dialog(receiver);
+    // Quit stops retesting: unattended, a defaulted characterization of known-bad data
+    // must never be stored.
     const AnswerWord word = ask({app::RcvrCharBadDlg::kTitle,
                                  dialog.promptText(),
-                                 {AnswerWord::Retest, AnswerWord::Quit, AnswerWord::Continue}});
+                                 {AnswerWord::Retest, AnswerWord::Quit, AnswerWord::Continue},
+                                 receiver + " data",
+                                 AnswerWord::Retest,
+                                 AnswerWord::Quit});
     const auto button = word == AnswerWord::Retest ? platform::BadDataChoice::Retest
                         : word == AnswerWord::Quit ? platform::BadDataChoice::Quit
                                                    : platform::BadDataChoice::Continue;

@@ -105,10 +105,10 @@ class ScriptPlayer {
 }  // namespace
 
 int runScripted(ConsoleSetup& setup, const std::vector<ScriptLine>& script, AnswerBook answers,
-                std::ostream& out, std::ostream& err) {
+                std::ostream& out, std::ostream& err, int maxRetries) {
     ConsoleOutput output(out, err);
     app::UiTaskQueue queue;
-    ScriptedAnswerer answerer(std::move(answers), output);
+    ScriptedAnswerer answerer(std::move(answers), output, maxRetries);
     ConsoleSession session(setup, output, queue, answerer, false);
     ScriptPlayer player(session, script);
     return session.run([&](app::CTarvexDlg& dlg) { player.play(dlg); });
