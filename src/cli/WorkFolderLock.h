@@ -14,10 +14,13 @@ namespace cli {
 
 class WorkFolderLocks {
   public:
-    // Locks the working folder (when it is one) and the simulator's state folder of the
-    // options for `holder` (e.g. "the dialog"); raises the refusal text when another process
-    // holds either.
-    WorkFolderLocks(const AnalyzerOptions& options, const std::string& holder);
+    enum class Scope { WorkingFolderAndState, StateOnly };
+
+    // Locks the working folder (when it is one, and the scope asks for it) and the
+    // simulator's state folder of the options for `holder` (e.g. "the dialog"); raises the
+    // refusal text when another process holds either.
+    WorkFolderLocks(const AnalyzerOptions& options, const std::string& holder,
+                    Scope scope = Scope::WorkingFolderAndState);
 
   private:
     std::vector<std::unique_ptr<platform::FolderLock>> m_locks;
