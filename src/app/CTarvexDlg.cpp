@@ -6,6 +6,7 @@
 
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "app/AccessoriesText.h"
+#include "engine/AttemptHistory.h"
 #include "engine/CharacterizationRun.h"
 #include "engine/RunContext.h"
 #include "platform/ErrorText.h"
@@ -68,6 +69,13 @@ void CTarvexDlg::initialize() {
     m_view.showSelection(m_selected);
 
     postAccessories();
+    // The previous dialog's flash command log goes into this run's history, not away.
+    try {
+        engine::keepEarlierAttempt(m_services.paths.toLocal(storage::FlashCommandLog::kWindowsPath),
+                                   m_historyDirectory);
+    } catch (...) {
+        m_writeFailures.report(platform::currentErrorText());
+    }
     m_flashLog.create();
 }
 

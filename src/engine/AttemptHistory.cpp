@@ -9,8 +9,8 @@ void keepEarlierAttempt(const std::filesystem::path& file,
         return;
     }
     const auto fail = [&](const std::string& reason) {
-        return std::string("Cannot keep the earlier attempt's " + file.filename().string() +
-                           " in " + historyFolder.string() + ": " + reason);
+        return std::string("Cannot keep the earlier " + file.filename().string() + " in " +
+                           historyFolder.string() + ": " + reason);
     };
     std::filesystem::create_directories(historyFolder, ec);
     if (ec) {

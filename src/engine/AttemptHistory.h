@@ -1,7 +1,8 @@
 #pragma once
 
-// A receiver's raw files of an earlier attempt are kept, not overwritten: before a new attempt
-// writes them, they move into the dialog run's history folder.
+// Files of an earlier attempt are kept, not overwritten: before a new attempt writes a
+// receiver's raw files, or a new dialog its flash command log, the earlier ones move into the
+// dialog run's history folder.
 
 #include <filesystem>
 #include <string>

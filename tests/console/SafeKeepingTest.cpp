@@ -162,8 +162,9 @@ TEST(DialogWriteFailures, AnExportThatCannotBeWrittenIsReportedAndEndsWithStatus
     EXPECT_EQ(readFile(run.dir() / "RcvrChar_A_Exported.txt"), "earlier export");
 }
 
-TEST(ThreadedDialogHistory, ARetestKeepsTheFailedAttemptsRawFiles) {
+TEST(ThreadedDialogHistory, ARetestKeepsTheFailedAttemptsRawFilesAndTheLastLog) {
     ConsoleRun run(R"({"options": "010,080", "faults": {"bad_data": {"R1": 1}}})");
+    testsupport::writeFile(run.dir() / "FlashCommands.txt", "the previous dialog's log\r\n");
     ASSERT_EQ(run.run("clear\nselect R1\nrun\nwait\n",
                       kOperator + "Characterization data issue! = Retest\nPlease Note = OK\n"),
               0)
@@ -177,4 +178,5 @@ TEST(ThreadedDialogHistory, ARetestKeepsTheFailedAttemptsRawFiles) {
     EXPECT_NE(readFile(history / "RcvrChar_AllMeasuredData_R1.1.csv"),
               readFile(run.dir() / "RcvrChar_AllMeasuredData_R1.csv"));
     EXPECT_FALSE(std::filesystem::exists(history / "rcvrCharRaw_R1.2.txt"));
+    EXPECT_EQ(readFile(history / "FlashCommands.1.txt"), "the previous dialog's log\r\n");
 }
