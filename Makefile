@@ -1,10 +1,13 @@
 # The two commands for a fresh machine: `make demo` and `make test`.
 JOBS ?= $(shell nproc)
 
-.PHONY: deps build demo test test-default test-asan test-tsan format clean
+.PHONY: deps test-deps build demo test test-default test-asan test-tsan format clean
 
 deps:
 	@scripts/install-deps
+
+test-deps:
+	@scripts/install-deps test
 
 build: deps
 	cmake --preset default >/dev/null
@@ -15,17 +18,17 @@ demo: build
 
 test: test-default test-asan test-tsan
 
-test-default: deps
+test-default: test-deps
 	cmake --preset default >/dev/null
 	cmake --build --preset default -j $(JOBS)
 	ctest --preset default -j $(JOBS) --label-exclude threads
 
-test-asan: deps
+test-asan: test-deps
 	cmake --preset asan >/dev/null
 	cmake --build --preset asan -j $(JOBS)
 	ctest --preset asan -j $(JOBS) --label-exclude threads
 
-test-tsan: deps
+test-tsan: test-deps
 	cmake --preset tsan >/dev/null
 	cmake --build --preset tsan -j $(JOBS)
 	ctest --preset tsan -j $(JOBS)
