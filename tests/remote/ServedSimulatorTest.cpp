@@ -90,16 +90,24 @@ class OverTheRawSocket : public ::testing::Test {
 }  // namespace
 
 TEST_F(OverTheRawSocket, TheDemoStoresWhatTheInProcessDemoStores) {
+    const auto started = std::chrono::steady_clock::now();
     const clitest::CommandRun local = clitest::runRcvrchar(
         m_dir, "--workdir local --analyzer 'sim:" + defaultScenario +
                    "' --sim-state local-state --script operator.script --answers answers.txt");
     ASSERT_EQ(local.status, 0) << local.err;
 
+    const auto localEnded = std::chrono::steady_clock::now();
     ServedSimulator served(m_dir / "lan-state", defaultScenario);
+    const auto lanStarted = std::chrono::steady_clock::now();
     const clitest::CommandRun lan = clitest::runRcvrchar(
         m_dir, "--workdir lan --analyzer " + served.resource() +
                    " --clock virtual --script operator.script --answers answers.txt");
+    const auto lanEnded = std::chrono::steady_clock::now();
     ASSERT_EQ(lan.status, 0) << lan.err << lan.out;
+    using Seconds = std::chrono::duration<double>;
+    std::printf("demo wall time: in-process %.3f s, over the loopback socket %.3f s\n",
+                Seconds(localEnded - started).count(), Seconds(lanEnded - lanStarted).count());
+    EXPECT_LT(lanEnded - lanStarted, std::chrono::seconds(2));
 
     auto lines = [](const std::string& text, const std::string& start) {
         int count = 0;
