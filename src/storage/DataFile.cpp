@@ -43,6 +43,10 @@ std::string writeWhole(const std::filesystem::path& path, std::string_view bytes
 
 void writeDataFile(const platform::PathMap& paths, const std::string& windowsPath,
                    std::string_view bytes) {
+    if (auto* files = paths.driveFiles(windowsPath)) {
+        files->write(windowsPath, bytes);
+        return;
+    }
     auto local = paths.toLocal(windowsPath);
     auto temporary = local;
     temporary += ".partial";
@@ -62,6 +66,9 @@ void writeDataFile(const platform::PathMap& paths, const std::string& windowsPat
 
 std::optional<std::string> readDataFile(const platform::PathMap& paths,
                                         const std::string& windowsPath) {
+    if (auto* files = paths.driveFiles(windowsPath)) {
+        return files->read(windowsPath);
+    }
     std::ifstream in(paths.toLocal(windowsPath), std::ios::binary);
     if (!in) {
         return std::nullopt;
