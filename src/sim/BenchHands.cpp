@@ -2,6 +2,8 @@
 
 #include <charconv>
 
+#include "scpi/ProgramMessage.h"
+
 namespace sim {
 namespace {
 
@@ -25,17 +27,6 @@ class LocalHands final : public BenchHands {
     Instrument& m_instrument;
 };
 
-std::string quoted(const std::string& text) {
-    std::string out = "\"";
-    for (char c : text) {
-        out += c;
-        if (c == '"') {
-            out += '"';
-        }
-    }
-    return out + "\"";
-}
-
 class LinkHands final : public BenchHands {
   public:
     explicit LinkHands(std::function<void(const std::string&)> send) : m_send(std::move(send)) {}
@@ -44,20 +35,21 @@ class LinkHands final : public BenchHands {
         char number[32];
         for (std::size_t i = 0; i < cables.size(); ++i) {
             command += i == 0 ? " " : ",";
-            command += quoted(cables[i].receiver) + "," + std::to_string(cables[i].port) + ",";
+            command +=
+                scpi::quotedString(cables[i].receiver) + "," + std::to_string(cables[i].port) + ",";
             command.append(number,
                            std::to_chars(number, number + sizeof number, cables[i].padDb).ptr);
         }
         m_send(command);
     }
     void recheckConnection(const std::string& receiver) override {
-        m_send("SIM:BENCH:RECH:CONN " + quoted(receiver));
+        m_send("SIM:BENCH:RECH:CONN " + scpi::quotedString(receiver));
     }
     void recheckPad(const std::string& receiver) override {
-        m_send("SIM:BENCH:RECH:PAD " + quoted(receiver));
+        m_send("SIM:BENCH:RECH:PAD " + scpi::quotedString(receiver));
     }
     void reseatConnector(const std::string& receiver) override {
-        m_send("SIM:BENCH:RES " + quoted(receiver));
+        m_send("SIM:BENCH:RES " + scpi::quotedString(receiver));
     }
 
   private:

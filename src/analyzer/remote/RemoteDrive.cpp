@@ -6,17 +6,6 @@
 namespace remote {
 namespace {
 
-std::string quoted(const std::string& text) {
-    std::string out = "\"";
-    for (char c : text) {
-        out += c;
-        if (c == '"') {
-            out += '"';
-        }
-    }
-    return out + "\"";
-}
-
 // The quoted entries of an MMEM:CAT? reply: "<name>,FILE|DIR,<size>,<date time>".
 std::vector<std::string> catalogEntries(std::string_view reply) {
     std::vector<std::string> entries;
@@ -53,8 +42,8 @@ std::pair<std::string, std::string> splitWindowsPath(const std::string& windowsP
 
 std::optional<DriveEntry> RemoteDrive::find(const std::string& windowsPath) {
     const auto [folder, name] = splitWindowsPath(windowsPath);
-    const std::string reply =
-        m_link->query("MMEM:CAT? " + quoted(folder), "listing the analyzer's folder " + folder);
+    const std::string reply = m_link->query("MMEM:CAT? " + scpi::quotedString(folder),
+                                            "listing the analyzer's folder " + folder);
     for (const std::string& entry : catalogEntries(reply)) {
         // The name may hold commas; the three fields after it do not.
         const auto third = entry.rfind(',');
@@ -76,7 +65,7 @@ std::optional<DriveEntry> RemoteDrive::find(const std::string& windowsPath) {
 }
 
 std::string RemoteDrive::transfer(const std::string& windowsPath, const std::string& doing) {
-    const std::string reply = m_link->query("MMEM:TRAN? " + quoted(windowsPath), doing);
+    const std::string reply = m_link->query("MMEM:TRAN? " + scpi::quotedString(windowsPath), doing);
     std::optional<scpi::BlockHeader> header;
     try {
         header = scpi::readBlockHeader(reply);
@@ -89,7 +78,7 @@ std::string RemoteDrive::transfer(const std::string& windowsPath, const std::str
 }
 
 void RemoteDrive::write(const std::string& windowsPath, std::string_view bytes) {
-    std::string message = "MMEM:TRAN " + quoted(windowsPath) + ",";
+    std::string message = "MMEM:TRAN " + scpi::quotedString(windowsPath) + ",";
     scpi::appendBlock(message, bytes);
     m_link->command(message, "writing the analyzer's file " + windowsPath);
     const std::string stored =
@@ -112,7 +101,7 @@ bool RemoteDrive::remove(const std::string& windowsPath) {
     if (!find(windowsPath)) {
         return false;
     }
-    m_link->command("MMEM:DEL " + quoted(windowsPath),
+    m_link->command("MMEM:DEL " + scpi::quotedString(windowsPath),
                     "deleting the analyzer's file " + windowsPath);
     return true;
 }
