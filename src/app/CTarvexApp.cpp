@@ -43,6 +43,11 @@ std::string CTarvexApp::restartCommandLine(const std::string& applicationDirecto
 }
 
 void CTarvexApp::restartAnalyzerApplication(const std::string& applicationDirectory) {
+    if (!m_services.processes.runsPrograms()) {
+        m_services.ui.messageBox({CRestartDlg::kByHandText, CRestartDlg::kByHandTitle,
+                                  platform::Buttons::Ok, platform::BoxNone});
+        return;
+    }
     // The notice window goes away however the restart ends.
     struct NoticeWindow {
         DialogView& view;

@@ -1,8 +1,18 @@
 #include "cli/AnalyzerOptions.h"
 
+#include <cmath>
+
+#include "analyzer/automation/BackendFactory.h"
+#include "analyzer/remote/RawSocketTransport.h"
+#include "analyzer/remote/RemoteApplication.h"
+#include "analyzer/remote/RemoteDrive.h"
+#include "analyzer/remote/RemoteProcessRunner.h"
+#include "analyzer/remote/ResourceString.h"
+#include "sim/BenchHands.h"
 #include "sim/Scenario.h"
 #include "sim/SimProcessRunner.h"
 #include "sim/SimulatedAnalyzer.h"
+#include "sim/SimulatedBench.h"
 
 namespace cli {
 namespace {
@@ -24,7 +34,8 @@ sim::Scenario scenarioOf(const std::string& analyzer) {
     if (analyzer.rfind("sim:", 0) == 0 && analyzer.size() > 4) {
         return sim::Scenario::fromFile(analyzer.substr(4));
     }
-    throw std::string("--analyzer must be sim or sim:SCENARIO.json, not \"" + analyzer + "\"");
+    throw std::string("--analyzer must be sim, sim:SCENARIO.json or a LAN resource string (" +
+                      std::string(remote::acceptedResourceForms) + "), not \"" + analyzer + "\"");
 }
 
 std::filesystem::path existingDirectory(const std::string& workdir) {
@@ -35,6 +46,13 @@ std::filesystem::path existingDirectory(const std::string& workdir) {
     return std::filesystem::absolute(workdir);
 }
 
+std::chrono::milliseconds timeoutOf(double seconds) {
+    if (!(seconds > 0 && seconds <= 3600)) {
+        throw std::string("--timeout must be a number of seconds above 0 and at most 3600");
+    }
+    return std::chrono::milliseconds(std::llround(seconds * 1000));
+}
+
 }  // namespace
 
 void addAnalyzerOptions(CLI::App& command, AnalyzerOptions& options) {
@@ -42,21 +60,32 @@ void addAnalyzerOptions(CLI::App& command, AnalyzerOptions& options) {
         ->capture_default_str();
     command
         .add_option("--analyzer", options.analyzer,
-                    "Analyzer back end: sim, or sim:SCENARIO.json for a scenario file")
+                    "Analyzer: sim, sim:SCENARIO.json for a scenario file, or an analyzer on the "
+                    "LAN, TCPIP::HOST[::PORT]::SOCKET or TCPIP::HOST[::inst0]::INSTR")
+        ->capture_default_str();
+    command
+        .add_option("--timeout", options.timeout,
+                    "Seconds each reply of a LAN analyzer may take, e.g. --timeout 20")
         ->capture_default_str();
     command.add_option("--sim-state", options.simState,
                        "State directory of the simulated analyzer (default: analyzer-sim in "
                        "the working directory)");
-    command.add_option("--clock", options.clock, "Fixed waits: real, or virtual (only counted)")
-        ->check(CLI::IsMember({"virtual", "real"}))
-        ->capture_default_str();
+    command
+        .add_option("--clock", options.clock,
+                    "Fixed waits: real, or virtual (only counted; the default for the built-in "
+                    "simulator, refused for an analyzer on the LAN that is not one)")
+        ->check(CLI::IsMember({"virtual", "real"}));
     command.add_option("--trace", options.trace, "Write every exchange with the analyzer here");
 }
 
 AnalyzerSession::AnalyzerSession(const AnalyzerOptions& options)
-    : m_workingDirectory(existingDirectory(options.workdir)),
-      m_clock(makeClock(options.clock)),
-      m_paths(m_workingDirectory) {
+    : m_workingDirectory(existingDirectory(options.workdir)), m_paths(m_workingDirectory) {
+    if (remote::isLanResource(options.analyzer)) {
+        openLan(options);
+        return;
+    }
+    m_virtualClock = options.clock != "real";
+    m_clock = makeClock(m_virtualClock ? "virtual" : "real");
     std::filesystem::path state = options.simState.empty()
                                       ? m_workingDirectory / "analyzer-sim"
                                       : std::filesystem::absolute(options.simState);
@@ -68,6 +97,58 @@ AnalyzerSession::AnalyzerSession(const AnalyzerOptions& options)
     m_paths.mapDrive('C', m_simulator->driveRoot());
     m_processes = std::make_unique<sim::SimProcessRunner>(*m_simulator, m_paths);
     m_simulator->registerAsBackend();
+}
+
+void AnalyzerSession::openLan(const AnalyzerOptions& options) {
+    const remote::ResourceString resource = remote::parseResourceString(options.analyzer);
+    const auto timeout = timeoutOf(options.timeout);
+    if (resource.kind != remote::ResourceString::Kind::Socket) {
+        throw std::string("The analyzer \"" + options.analyzer +
+                          "\" is a VXI-11 resource; this build reaches analyzers through "
+                          "TCPIP::HOST[::PORT]::SOCKET only");
+    }
+    m_link = std::make_shared<remote::ScpiLink>(
+        std::make_unique<remote::RawSocketTransport>(resource, timeout), timeout);
+    if (!options.trace.empty()) {
+        m_link->setTraceFile(options.trace);
+    }
+    // A simulator-only query beside *IDN?: a real analyzer answers only the second, and
+    // its -113 for the first is cleared at once.
+    const std::string reply = m_link->query("SIM:VERS?;*IDN?", "identifying the analyzer");
+    m_servedSimulator = reply.rfind("1;", 0) == 0;
+    m_identification = m_servedSimulator ? reply.substr(2) : reply;
+    if (!m_servedSimulator) {
+        m_link->command("*CLS", "clearing the simulator probe's error");
+    }
+    m_virtualClock = options.clock.empty() ? false : options.clock == "virtual";
+    if (m_virtualClock && !m_servedSimulator) {
+        throw std::string("--clock virtual is refused for " + options.analyzer + " (" +
+                          m_identification +
+                          "): it is not the rcvrchar simulator, and skipping the waits on a "
+                          "real analyzer would measure garbage");
+    }
+    m_clock = makeClock(m_virtualClock ? "virtual" : "real");
+    m_drive = std::make_unique<remote::RemoteDrive>(m_link);
+    m_paths.mapDrive('C', *m_drive);
+    m_processes = std::make_unique<remote::RemoteProcessRunner>(*m_drive, m_paths);
+    std::shared_ptr<remote::ScpiLink> link = m_link;
+    automation::BackendFactory::registerBackend(
+        "lan", [link](const std::string&) { return remote::makeApplication(link); });
+    automation::BackendFactory::setDefaultBackend("lan");
+}
+
+std::shared_ptr<platform::OperatorUi> AnalyzerSession::wrapUi(platform::OperatorUi& frontEnd) {
+    if (m_simulator) {
+        return std::make_shared<sim::SimulatedBench>(frontEnd, *m_simulator);
+    }
+    if (!m_servedSimulator) {
+        return nullptr;
+    }
+    std::shared_ptr<remote::ScpiLink> link = m_link;
+    return std::make_shared<sim::SimulatedBench>(
+        frontEnd, sim::handsOverLink([link](const std::string& command) {
+            link->command(command, "telling the simulator what the operator cabled");
+        }));
 }
 
 AnalyzerSession::~AnalyzerSession() = default;

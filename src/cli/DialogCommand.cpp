@@ -16,7 +16,6 @@
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "platform/RunSignals.h"
 #include "sim/SimulatedAnalyzer.h"
-#include "sim/SimulatedBench.h"
 
 namespace {
 
@@ -101,9 +100,7 @@ int runDialog(const DialogOptions& options) {
         session.processes(),
         signals,
         std::filesystem::current_path(),
-        [&session](platform::OperatorUi& frontEnd) -> std::shared_ptr<platform::OperatorUi> {
-            return std::make_shared<sim::SimulatedBench>(frontEnd, session.simulator());
-        },
+        [&session](platform::OperatorUi& frontEnd) { return session.wrapUi(frontEnd); },
     };
     int status = 0;
     if (scripted) {
@@ -115,7 +112,7 @@ int runDialog(const DialogOptions& options) {
         status = console::runInteractive(setup, input, std::cout, std::cerr, &g_closeRequested);
         std::signal(SIGINT, SIG_DFL);
     }
-    if (options.analyzer.clock == "virtual") {
+    if (session.virtualClock()) {
         const auto waited = std::chrono::duration_cast<std::chrono::duration<double>>(
             session.clock().totalWaited());
         std::cerr << "rcvrchar: protocol waits counted by the virtual clock: " << waited.count()
@@ -127,7 +124,6 @@ int runDialog(const DialogOptions& options) {
 const cli::CommandRegistration registration{
     "", [](CLI::App& app) -> std::function<int()> {
         auto options = std::make_shared<DialogOptions>();
-        options->analyzer.clock = "virtual";
         app.description(kDescription);
         cli::addAnalyzerOptions(app, options->analyzer);
         app.add_option("--script", options->script,

@@ -9,7 +9,6 @@
 #include "frontends/qt/QtDialogFrontEnd.h"
 #include "platform/RunSignals.h"
 #include "sim/SimulatedAnalyzer.h"
-#include "sim/SimulatedBench.h"
 #endif
 
 namespace cli {
@@ -32,10 +31,7 @@ int runGuiDialog(const AnalyzerOptions& options) {
         .processes = session.processes(),
         .signals = signals,
         .workingDirectory = std::filesystem::current_path(),
-        .wrapUi =
-            [&session](platform::OperatorUi& frontEnd) -> std::shared_ptr<platform::OperatorUi> {
-            return std::make_shared<sim::SimulatedBench>(frontEnd, session.simulator());
-        },
+        .wrapUi = [&session](platform::OperatorUi& frontEnd) { return session.wrapUi(frontEnd); },
         .onWindow = nullptr};
     return qtui::runQtDialog(setup, std::cerr);
 #else

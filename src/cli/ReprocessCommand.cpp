@@ -36,8 +36,27 @@ constexpr int kFailedCriteria = 2;
 int reprocess(const ReprocessOptions& options) {
     CT3872Acomcal config;
     config.SetModel(options.model);
-    config.SetOptions(SplitOptionReply(options.options));
+    // "010, 080" as typed on a command line means the options 010 and 080.
+    std::vector<std::string> optionList = SplitOptionReply(options.options);
+    for (auto& option : optionList) {
+        const auto first = option.find_first_not_of(" \t");
+        const auto last = option.find_last_not_of(" \t");
+        option =
+            first == std::string::npos ? std::string() : option.substr(first, last - first + 1);
+    }
+    config.SetOptions(optionList);
     config.ReadSequence(options.file);
+    std::string known;
+    bool found = false;
+    for (const auto& calibration : config.GetCalibrations()) {
+        found = found || calibration.GetName() == options.receiver;
+        known += (known.empty() ? "" : ", ") + calibration.GetName();
+    }
+    if (!found) {
+        throw std::string("--receiver " + options.receiver + " is not a receiver of the " +
+                          options.model + " with options \"" + options.options + "\"; its " +
+                          "receivers are " + known);
+    }
 
     const engine::RunConstants constants = engine::readRunConstants(config);
     const engine::ReceiverSetup setup =

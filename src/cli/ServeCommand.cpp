@@ -52,7 +52,11 @@ int serve(ServeOptions options) {
     const cli::WorkFolderLocks locks(options.analyzer, "serve",
                                      cli::WorkFolderLocks::Scope::StateOnly);
     cli::AnalyzerSession session(options.analyzer);
-    const auto device = session.simulator().scpiDevice();
+    if (!session.simulator()) {
+        throw std::string("serve puts the simulated analyzer on the network; --analyzer " +
+                          options.analyzer.analyzer + " is not the simulator");
+    }
+    const auto device = session.simulator()->scpiDevice();
 
     // Servers go before the context they run on, and the device after both.
     lan::ServerContext context(2);

@@ -52,6 +52,24 @@ void splitCells(std::string_view line, std::vector<std::string_view>& cells) {
     }
 }
 
+// A line as an error message may show it: at most 80 characters, other bytes than
+// printable ASCII as \xNN, so that a binary file never reaches the terminal raw.
+std::string shown(std::string_view line) {
+    std::string text;
+    for (char c : line.substr(0, 80)) {
+        const auto byte = static_cast<unsigned char>(c);
+        if (byte >= 0x20 && byte < 0x7F) {
+            text += c;
+        } else {
+            constexpr char hex[] = "0123456789ABCDEF";
+            text += "\\x";
+            text += hex[byte >> 4];
+            text += hex[byte & 0xF];
+        }
+    }
+    return line.size() > 80 ? text + "..." : text;
+}
+
 template <typename T>
 bool parseNumber(std::string_view text, T& value) {
     const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
@@ -72,13 +90,13 @@ void readAllMeasuredData(CCompressionData& store, const std::filesystem::path& f
     splitCells(line, cells);
     if (cells.empty() || cells[0] != "Freq" || cells.size() != 1 + 3 * levels) {
         lines.fail("the header does not name the " + std::to_string(levels) +
-                   " power levels of the ladder: " + line);
+                   " power levels of the ladder: " + shown(line));
     }
     for (std::size_t i = 0; i < levels; ++i) {
         const std::string expected = "Rec Pow(" + platform::generalText(ladder[i]) + ")";
         if (cells[1 + 3 * i] != expected) {
             lines.fail("header column " + std::to_string(2 + 3 * i) + " is \"" +
-                       std::string(cells[1 + 3 * i]) + "\", the ladder gives \"" + expected + "\"");
+                       shown(cells[1 + 3 * i]) + "\", the ladder gives \"" + expected + "\"");
         }
     }
 
@@ -103,7 +121,7 @@ void readAllMeasuredData(CCompressionData& store, const std::filesystem::path& f
         planText.clear();
         platform::appendGeneral(planText, frequencies[row], 15);
         if (cells[0] != planText) {
-            lines.fail("frequency " + std::string(cells[0]) + " differs from the band plan's " +
+            lines.fail("frequency " + shown(cells[0]) + " differs from the band plan's " +
                        planText);
         }
         if (cells.size() != 1 + 3 * levels) {
@@ -115,7 +133,7 @@ void readAllMeasuredData(CCompressionData& store, const std::filesystem::path& f
             for (std::size_t c = 0; c < 3; ++c) {
                 if (!parseNumber(cells[1 + 3 * i + c], values[c])) {
                     lines.fail("cell " + std::to_string(2 + 3 * i + c) + " \"" +
-                               std::string(cells[1 + 3 * i + c]) + "\" is not a number");
+                               shown(cells[1 + 3 * i + c]) + "\" is not a number");
                 }
             }
             test[i].push_back(values[0]);

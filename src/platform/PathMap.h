@@ -8,6 +8,8 @@
 #include <map>
 #include <string>
 
+#include "platform/DriveFiles.h"
+
 namespace platform {
 
 class PathMap {
@@ -15,6 +17,9 @@ class PathMap {
     virtual ~PathMap() = default;
     // Raises an error text naming the path when it cannot be mapped (an unknown drive).
     virtual std::filesystem::path toLocal(const std::string& windowsPath) const = 0;
+    // The instrument's file service when the path lies on a drive reached through it;
+    // nullptr when the path maps to a local file.
+    virtual DriveFiles* driveFiles(const std::string&) const { return nullptr; }
 };
 
 class DrivePathMap final : public PathMap {
@@ -22,12 +27,17 @@ class DrivePathMap final : public PathMap {
     explicit DrivePathMap(std::filesystem::path workingDirectory);
     // Drive letter (upper or lower case) to the local folder that stands in for its root.
     void mapDrive(char letter, std::filesystem::path root);
+    // The drive lives on the analyzer computer and is reached through the instrument; the
+    // files must outlive the map. toLocal refuses its paths.
+    void mapDrive(char letter, DriveFiles& files);
     std::filesystem::path toLocal(const std::string& windowsPath) const override;
+    DriveFiles* driveFiles(const std::string& windowsPath) const override;
     const std::filesystem::path& workingDirectory() const { return m_workingDirectory; }
 
   private:
     std::filesystem::path m_workingDirectory;
     std::map<char, std::filesystem::path> m_drives;
+    std::map<char, DriveFiles*> m_remoteDrives;
 };
 
 }  // namespace platform

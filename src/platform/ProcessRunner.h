@@ -16,6 +16,9 @@ class ProcessRunner {
     // Runs one command of the command interpreter synchronously, e.g.
     // dir /-C "C:\...\RcvrCharRef.dat" > fileInfo.txt, or del "C:\...\RcvrCharRef.dat".
     virtual int runCommand(const std::string& command) = 0;
+    // False when programs of the analyzer computer cannot be started from here (an
+    // analyzer on the LAN): the operator must restart its application by hand.
+    virtual bool runsPrograms() const { return true; }
 };
 
 }  // namespace platform

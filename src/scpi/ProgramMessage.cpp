@@ -46,6 +46,20 @@ std::size_t blockEnd(std::string_view text, std::size_t hash) {
 
 }  // namespace
 
+std::string quotedString(std::string_view text) {
+    std::string out;
+    out.reserve(text.size() + 2);
+    out += '"';
+    for (char c : text) {
+        out += c;
+        if (c == '"') {
+            out += '"';
+        }
+    }
+    out += '"';
+    return out;
+}
+
 std::string upperCased(std::string_view text) {
     std::string upper(text);
     for (char& c : upper) {

@@ -15,6 +15,9 @@ namespace scpi {
 // Keywords and words compare as the "C" locale upper-cases them.
 std::string upperCased(std::string_view text);
 
+// Text as a quoted string parameter or reply: in double quotes, each quote inside doubled.
+std::string quotedString(std::string_view text);
+
 // An instrument-side error: queued as code,"message"; never leaves the parser.
 struct Error {
     int code;

@@ -11,7 +11,7 @@
 namespace sim {
 
 inline std::string inQuotes(const std::string& text) {
-    return "\"" + text + "\"";
+    return scpi::quotedString(text);
 }
 
 inline std::string boolText(bool on) {

@@ -472,6 +472,10 @@ void Instrument::deleteMeasurement(const std::string& name) {
 
 void Instrument::cableReceivers(const std::vector<Cable>& cables) {
     std::lock_guard lock(m_mutex);
+    cableReceiversHeld(cables);
+}
+
+void Instrument::cableReceiversHeld(const std::vector<Cable>& cables) {
     for (auto& [name, bench] : m_bench) {
         bench.cabled = false;
     }
@@ -502,6 +506,10 @@ void Instrument::cableReceivers(const std::vector<Cable>& cables) {
 
 void Instrument::operatorRecheckedConnection(const std::string& receiver) {
     std::lock_guard lock(m_mutex);
+    operatorRecheckedConnectionHeld(receiver);
+}
+
+void Instrument::operatorRecheckedConnectionHeld(const std::string& receiver) {
     auto it = m_bench.find(receiver);
     if (it != m_bench.end() && it->second.disconnectedLeft > 0) {
         --it->second.disconnectedLeft;
@@ -511,6 +519,10 @@ void Instrument::operatorRecheckedConnection(const std::string& receiver) {
 
 void Instrument::operatorRecheckedPad(const std::string& receiver) {
     std::lock_guard lock(m_mutex);
+    operatorRecheckedPadHeld(receiver);
+}
+
+void Instrument::operatorRecheckedPadHeld(const std::string& receiver) {
     auto it = m_bench.find(receiver);
     if (it != m_bench.end() && m_scenario.faults.wrongPadDb.count(receiver) &&
         !it->second.padRechecked) {
@@ -524,6 +536,10 @@ void Instrument::operatorRecheckedPad(const std::string& receiver) {
 
 void Instrument::operatorSawBadData(const std::string& receiver) {
     std::lock_guard lock(m_mutex);
+    operatorSawBadDataHeld(receiver);
+}
+
+void Instrument::operatorSawBadDataHeld(const std::string& receiver) {
     auto it = m_bench.find(receiver);
     if (it != m_bench.end() && it->second.badDataLeft > 0) {
         --it->second.badDataLeft;

@@ -124,7 +124,9 @@ class Instrument {
 
     // One program message from the automation parser of an application generation.
     std::string parse(unsigned generation, std::string_view message);
-    // One program message from a client on the network, whatever the generation.
+    // One program message from a client on the network, whatever the generation. A query
+    // that ran but has nothing to say answers "" (an empty string), so that the client's
+    // wait for its response ends.
     std::string execute(std::string_view message);
     std::uint8_t statusByte(bool messageAvailable);
     void reportError(int code, const std::string& message);
@@ -214,6 +216,13 @@ class Instrument {
     Connection connectionOf(const std::string& receiver) const;
 
   private:
+    // The bench operations under the lock, for the simulator-only bench commands.
+    void cableReceiversHeld(const std::vector<Cable>& cables);
+    void operatorRecheckedConnectionHeld(const std::string& receiver);
+    void operatorRecheckedPadHeld(const std::string& receiver);
+    void operatorSawBadDataHeld(const std::string& receiver);
+    void addBenchCommands();
+
     struct BenchState {
         Connection connection;
         double instructedPadDb = 0.0;
@@ -247,7 +256,8 @@ class Instrument {
     void addDataCommands();
     void addFileCommands();
     void addDiagnosticCommands();
-    std::string runMessage(std::string_view message);
+    // answeredQuery, when given, is set when a query of the message ran without error.
+    std::string runMessage(std::string_view message, bool* answeredQuery = nullptr);
     void queueError(int code, const std::string& message);
     void applyErrorRules(std::string_view unit);
     void seedStoredCalibrations();

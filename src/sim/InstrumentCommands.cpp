@@ -34,7 +34,11 @@ std::string Instrument::execute(std::string_view message) {
     std::unique_lock lock(m_mutex);
     HeldLock held(*this, lock);
     m_transcript.record('>', message);
-    return runMessage(message);
+    bool answered = false;
+    std::string reply = runMessage(message, &answered);
+    // A network client waits for one response to every query; an empty reply must still
+    // reach it, and an empty line cannot be told from no response on a raw socket.
+    return reply.empty() && answered ? std::string("\"\"") : reply;
 }
 
 std::uint8_t Instrument::statusByte(bool messageAvailable) {
@@ -47,7 +51,7 @@ void Instrument::reportError(int code, const std::string& message) {
     queueError(code, message);
 }
 
-std::string Instrument::runMessage(std::string_view message) {
+std::string Instrument::runMessage(std::string_view message, bool* answeredQuery) {
     std::string reply;
     bool first = true;
     std::vector<std::string> path;
@@ -58,6 +62,9 @@ std::string Instrument::runMessage(std::string_view message) {
             scpi::ParameterReader parameters(header.parameters);
             part = m_commands.dispatch(header, rootedHeader(unit), path, parameters);
             parameters.finish();
+            if (header.query && answeredQuery) {
+                *answeredQuery = true;
+            }
         } catch (const scpi::Error& error) {
             queueError(error.code, error.message);
             part.clear();
@@ -101,6 +108,7 @@ void Instrument::buildCommands() {
     addMeasurementCommands();
     addFileCommands();
     addDiagnosticCommands();
+    addBenchCommands();
 }
 
 void Instrument::addDiagnosticCommands() {

@@ -7,25 +7,27 @@
 namespace sim {
 
 SimulatedBench::SimulatedBench(platform::OperatorUi& frontEnd, SimulatedAnalyzer& analyzer)
-    : m_frontEnd(frontEnd), m_analyzer(analyzer) {}
+    : SimulatedBench(frontEnd, handsOn(analyzer.instrument())) {}
+
+SimulatedBench::SimulatedBench(platform::OperatorUi& frontEnd, std::unique_ptr<BenchHands> hands)
+    : m_frontEnd(frontEnd), m_hands(std::move(hands)) {}
 
 platform::Answer SimulatedBench::messageBox(const platform::MessageBox& box) {
     platform::Answer answer = m_frontEnd.messageBox(box);
-    Instrument& instrument = m_analyzer.instrument();
     if (box.caption == "Connections") {
         auto cables = readConnectionInstructions(box.text);
         if (!cables.empty()) {
-            instrument.cableReceivers(cables);
+            m_hands->cable(cables);
         }
     } else if (box.caption == "Check Connection" && answer == platform::Answer::Yes) {
         // Checking the connection, the operator also makes sure the instructed pad is fitted.
         if (auto receiver = receiverOfConnectionComplaint(box.text)) {
-            instrument.operatorRecheckedConnection(*receiver);
-            instrument.operatorRecheckedPad(*receiver);
+            m_hands->recheckConnection(*receiver);
+            m_hands->recheckPad(*receiver);
         }
     } else if (box.caption == "Unexpected power ratio reading" && answer == platform::Answer::Yes) {
         for (const auto& cable : readConnectionInstructions(box.text)) {
-            instrument.operatorRecheckedPad(cable.receiver);
+            m_hands->recheckPad(cable.receiver);
         }
     }
     return answer;
@@ -33,7 +35,7 @@ platform::Answer SimulatedBench::messageBox(const platform::MessageBox& box) {
 
 platform::BadDataChoice SimulatedBench::badDataChoice(const std::string& receiver) {
     platform::BadDataChoice choice = m_frontEnd.badDataChoice(receiver);
-    m_analyzer.instrument().operatorSawBadData(instrumentReceiver(receiver));
+    m_hands->reseatConnector(instrumentReceiver(receiver));
     return choice;
 }
 

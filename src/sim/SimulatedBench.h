@@ -7,7 +7,10 @@
 // "Unexpected power ratio reading" answered Yes refits the instructed pad; the bad-data
 // dialog makes the operator reseat a loose connector.
 
+#include <memory>
+
 #include "platform/OperatorUi.h"
+#include "sim/BenchHands.h"
 
 namespace sim {
 
@@ -17,13 +20,15 @@ class SimulatedBench final : public platform::OperatorUi {
   public:
     // Both must outlive the bench.
     SimulatedBench(platform::OperatorUi& frontEnd, SimulatedAnalyzer& analyzer);
+    // The front end must outlive the bench.
+    SimulatedBench(platform::OperatorUi& frontEnd, std::unique_ptr<BenchHands> hands);
 
     platform::Answer messageBox(const platform::MessageBox& box) override;
     platform::BadDataChoice badDataChoice(const std::string& receiver) override;
 
   private:
     platform::OperatorUi& m_frontEnd;
-    SimulatedAnalyzer& m_analyzer;
+    std::unique_ptr<BenchHands> m_hands;
 };
 
 }  // namespace sim

@@ -78,7 +78,12 @@ TEST(ExportCommand, UnusableOptionsAreNamed) {
     testsupport::TempDir dir;
     CommandRun backEnd = runRcvrchar(dir, "export --analyzer gpib:7");
     EXPECT_EQ(backEnd.status, 1);
-    EXPECT_EQ(backEnd.err, "--analyzer must be sim or sim:SCENARIO.json, not \"gpib:7\"\n");
+    EXPECT_EQ(backEnd.err.rfind(
+                  "--analyzer must be sim, sim:SCENARIO.json or a LAN resource string (", 0),
+              0u)
+        << backEnd.err;
+    EXPECT_NE(backEnd.err.find("TCPIP[n]::HOST[::PORT]::SOCKET"), std::string::npos);
+    EXPECT_NE(backEnd.err.find("not \"gpib:7\"\n"), std::string::npos) << backEnd.err;
     CommandRun workdir = runRcvrchar(dir, "export --workdir absent");
     EXPECT_EQ(workdir.status, 1);
     EXPECT_EQ(workdir.err, "--workdir absent is not a directory\n");

@@ -111,6 +111,16 @@ TEST(ReprocessCommand, ErrorsGoToStderrWithStatusOne) {
     EXPECT_NE(result.err.find("in.csv line 1: the header does not name the"), std::string::npos)
         << result.err;
 
+    CommandRun unknown =
+        runRcvrchar(dir,
+                    "reprocess --csv in.csv --receiver Q --model T3871B --options ' 010 ' --out . "
+                    "--file " +
+                        quotedSample());
+    EXPECT_EQ(unknown.status, 1);
+    EXPECT_EQ(unknown.err,
+              "--receiver Q is not a receiver of the T3871B with options \" 010 \"; "
+              "its receivers are R1, R2, A, B\n");
+
     CommandRun noFile = runRcvrchar(
         dir, "reprocess --csv in.csv --receiver A --model T3871B --out . --file missing.dat");
     EXPECT_EQ(noFile.status, 1);

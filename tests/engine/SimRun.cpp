@@ -1,5 +1,7 @@
 #include "SimRun.h"
 #include "SentCommands.h"
+#include "analyzer/automation/BackendFactory.h"
+#include "analyzer/remote/RemoteApplication.h"
 
 namespace enginetest {
 
@@ -14,7 +16,7 @@ void CollectingNotices::postnotice(const std::string& text) {
 
 SimRun::SimRun(const std::string& scenarioMembers, const std::string& model,
                const std::vector<std::string>& options,
-               const std::function<void(std::string&)>& configEdit)
+               const std::function<void(std::string&)>& configEdit, bool overLan)
     : simulator(std::make_unique<sim::SimulatedAnalyzer>(
           sim::Scenario::fromJson("{" + scenarioMembers + "}"), dir / "analyzer")),
       paths(dir / "work"),
@@ -25,8 +27,24 @@ SimRun::SimRun(const std::string& scenarioMembers, const std::string& model,
     ui.answerAll(platform::Answer::Ok);
     ui.answer("Check Connection", {platform::Answer::No});
     ui.answer("Unexpected power ratio reading", {platform::Answer::No});
-    bench = std::make_unique<sim::SimulatedBench>(ui, *simulator);
-    analyzer = std::make_unique<CNetworkAnalyzer>("", *bench, clock);
+    std::string host;
+    if (overLan) {
+        device = simulator->scpiDevice();
+        auto owned = std::make_unique<testsupport::DeviceTransport>(*device);
+        transport = owned.get();
+        link = std::make_shared<remote::ScpiLink>(std::move(owned), std::chrono::seconds(10));
+        host = "lan-test";
+        automation::BackendFactory::registerBackend(
+            host, [link = link](const std::string&) { return remote::makeApplication(link); });
+        // The operator's cabling reaches the instrument as a served simulator learns it.
+        bench = std::make_unique<sim::SimulatedBench>(
+            ui, sim::handsOverLink([link = link](const std::string& command) {
+                link->command(command, "playing the bench");
+            }));
+    } else {
+        bench = std::make_unique<sim::SimulatedBench>(ui, *simulator);
+    }
+    analyzer = std::make_unique<CNetworkAnalyzer>(host, *bench, clock);
     analyzer->readmodel(true);
     analyzer->readoptions(true);
     log.create();

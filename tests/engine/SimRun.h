@@ -8,8 +8,10 @@
 #include <string>
 #include <vector>
 
+#include "DeviceTransport.h"
 #include "TempDir.h"
 #include "analyzer/NetworkAnalyzerClass.h"
+#include "analyzer/remote/ScpiLink.h"
 #include "config/T3872Acomcal.h"
 #include "engine/CharacterizationRun.h"
 #include "platform/ScriptedOperatorUi.h"
@@ -31,9 +33,12 @@ class SimRun {
   public:
     // scenarioMembers: members of the scenario's JSON object, without braces.
     // configEdit: changes the sample configuration's text before it is read.
+    // overLan: the proxy reaches the simulator through the LAN back end, over an in-memory
+    // link onto the simulator's SCPI device.
     explicit SimRun(const std::string& scenarioMembers = "", const std::string& model = "T3872A",
                     const std::vector<std::string>& options = {"010", "080"},
-                    const std::function<void(std::string&)>& configEdit = nullptr);
+                    const std::function<void(std::string&)>& configEdit = nullptr,
+                    bool overLan = false);
 
     int run(std::vector<std::string> receivers, const std::string& searchMode = "Port-Search");
 
@@ -45,6 +50,10 @@ class SimRun {
 
     testsupport::TempDir dir;
     std::unique_ptr<sim::SimulatedAnalyzer> simulator;
+    std::unique_ptr<scpi::Device> device;
+    // Set when the run goes over the LAN back end.
+    testsupport::DeviceTransport* transport = nullptr;
+    std::shared_ptr<remote::ScpiLink> link;
     platform::ScriptedOperatorUi ui;
     std::unique_ptr<sim::SimulatedBench> bench;
     platform::VirtualClock clock;
