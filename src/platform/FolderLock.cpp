@@ -45,15 +45,18 @@ FolderLock::FolderLock(const std::filesystem::path& folder, const std::string& h
         throw std::string("Cannot lock the folder " + folder.string() + " (" + path.string() +
                           "): " + std::strerror(error));
     }
+    // Without the note the lock still holds; a refused process only cannot name the holder.
     const std::string line = holder + ", process " + std::to_string(::getpid()) + "\n";
-    if (::ftruncate(m_fd, 0) != 0 ||
-        ::pwrite(m_fd, line.data(), line.size(), 0) != static_cast<ssize_t>(line.size())) {
-        // The lock holds without the note; only a refused second process loses the detail.
-    }
+    [[maybe_unused]] const bool noted =
+        ::ftruncate(m_fd, 0) == 0 &&
+        ::pwrite(m_fd, line.data(), line.size(), 0) == static_cast<ssize_t>(line.size());
 }
 
 FolderLock::~FolderLock() {
     if (m_fd >= 0) {
+        // Emptied, not removed: removing a lock file lets two processes lock two files of one
+        // name. Empty, the file is the same after every run.
+        [[maybe_unused]] const bool emptied = ::ftruncate(m_fd, 0) == 0;
         ::close(m_fd);
     }
 }

@@ -75,6 +75,8 @@ TEST(FolderLock, ASecondHolderIsRefusedUntilTheFirstIsGone) {
                       std::to_string(::getpid()) +
                       "); wait until it has ended, or use another folder");
     }
+    // Released, the note is gone and the next holder is let in.
+    EXPECT_EQ(readFile(dir / platform::FolderLock::kFileName), "");
     EXPECT_EQ(errorOf([&] { platform::FolderLock again(dir.path(), "export"); }), "nothing thrown");
     writeFile(dir / "file", "x");
     EXPECT_NE(errorOf([&] {
