@@ -100,10 +100,6 @@ class CTarvexDlg {
     // Some file the dialog or a run wrote whole could not be written (reported in the log
     // and an "Error" box).
     bool anyWriteFailed() const { return m_writeFailures.anyFailed(); }
-    // Where this dialog keeps backups of what it erases or replaces, and earlier attempts'
-    // raw files.
-    const storage::StoredBackups& backups() const { return m_backups; }
-    const std::filesystem::path& historyDirectory() const { return m_historyDirectory; }
 
   private:
     struct RunRequest;

@@ -27,7 +27,6 @@ class WholeFile {
     // Flushes, syncs and closes the partial file, then renames it over the target.
     void commit();
 
-    const std::filesystem::path& target() const { return m_target; }
     static std::filesystem::path partialPath(const std::filesystem::path& target);
 
   private:

@@ -33,7 +33,6 @@ class StoredBackups {
 
     // The folder of the latest backup of each receiver saved through this object.
     std::map<std::string, std::filesystem::path> latest() const;
-    const std::filesystem::path& root() const { return m_root; }
 
   private:
     std::filesystem::path m_root;
