@@ -180,8 +180,12 @@ class RawSocketServer::RawConnection : public Connection,
                 break;
             case Action::Drop:
             case Action::Restart:
+                // The response still goes out whole; the connection closes after it.
+                if (!response.empty()) {
+                    send({std::move(response)});
+                }
                 closeAfterOutput();
-                break;
+                return;
             case Action::CutResponse:
                 response.resize(response.size() / 2);
                 send({std::move(response), false});

@@ -41,6 +41,7 @@ def main(fault, resource):
         fails("a query after the drop", lambda: first.query("*IDN?"))
     elif fault == "drop_mid_response_on":  # CALC:DATA?
         first.write("FORM REAL,64")
+        first.query("SENS:SWE:MODE SING;*OPC?")
         fails("a trace cut off halfway",
               lambda: first.query_binary_values("CALC:DATA? FDATA", datatype="d"))
     elif fault == "stall_on":  # *IDN?
