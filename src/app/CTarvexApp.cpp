@@ -29,7 +29,7 @@ int CTarvexApp::run(const ModalLoop& modalLoop) {
         throw;
     }
     dlg.shutdown();
-    if (status == 0 && dlg.anyRunFailed()) {
+    if (status == 0 && (dlg.anyRunFailed() || dlg.anyWriteFailed())) {
         status = exitRunFailed;
     }
     if (m_services.signals.restartRequested) {

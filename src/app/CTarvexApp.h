@@ -23,7 +23,8 @@ class CTarvexApp {
 
     // Returns the exit status: 0 when the dialog ended by Exit or Close and every run it
     // started finished, 1 when an error text (or the analyzer's "Critical Error") ended it,
-    // 3 when it ended normally but a run ended on an error or an abort. A ProgramStop from
+    // 3 when it ended normally but a run ended on an error or an abort, or a file could not be
+    // written. A ProgramStop from
     // the front end passes through after the dialog has been shut down, without the restart.
     int run(const ModalLoop& modalLoop);
 

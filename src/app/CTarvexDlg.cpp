@@ -1,11 +1,15 @@
 #include "app/CTarvexDlg.h"
 
 #include <algorithm>
+#include <chrono>
+#include <ctime>
 
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "app/AccessoriesText.h"
+#include "engine/AttemptHistory.h"
 #include "engine/CharacterizationRun.h"
 #include "engine/RunContext.h"
+#include "platform/ErrorText.h"
 #include "storage/EraseCal.h"
 #include "storage/ExportCals.h"
 #include "storage/FlashCatalog.h"
@@ -17,7 +21,16 @@ CTarvexDlg::CTarvexDlg(DialogView& view, DialogServices& services, UiTaskQueue& 
       m_services(services),
       m_queue(queue),
       m_notices(queue, [this](const std::string& text) { onNotice(text); }),
-      m_flashLog(services.paths) {}
+      m_flashLog(services.paths),
+      m_backups(services.workingDirectory / "backups", services.processes),
+      m_writeFailures(services.ui, m_notices) {
+    const std::time_t now = std::chrono::system_clock::to_time_t(std::chrono::system_clock::now());
+    std::tm local{};
+    localtime_r(&now, &local);
+    char stamp[32];
+    std::strftime(stamp, sizeof stamp, "%Y%m%d-%H%M%S", &local);
+    m_historyDirectory = services.workingDirectory / "history" / stamp;
+}
 
 CTarvexDlg::~CTarvexDlg() {
     m_services.signals.abortRequested = true;
@@ -49,15 +62,20 @@ void CTarvexDlg::initialize() {
         m_searchMode = "Port-Search";
     }
 
-    storage::StorageContext context{*m_proxy, m_services.ui, m_services.clock, m_services.paths,
-                                    m_flashLog};
-    storage::catalogFlash(context, m_services.processes, m_receivers, m_findings);
+    storage::catalogFlash(storageContext(), m_services.processes, m_receivers, m_findings);
 
     m_selected.assign(m_receivers.size(), true);
     m_view.showReceivers(m_receivers);
     m_view.showSelection(m_selected);
 
     postAccessories();
+    // The previous dialog's flash command log goes into this run's history, not away.
+    try {
+        engine::keepEarlierAttempt(m_services.paths.toLocal(storage::FlashCommandLog::kWindowsPath),
+                                   m_historyDirectory);
+    } catch (...) {
+        m_writeFailures.report(platform::currentErrorText());
+    }
     m_flashLog.create();
 }
 
@@ -141,9 +159,16 @@ void CTarvexDlg::onExport() {
     if (workerRunning() || !m_proxy) {
         return;
     }
-    storage::StorageContext context{*m_proxy, m_services.ui, m_services.clock, m_services.paths,
-                                    m_flashLog};
-    storage::exportCals(context, m_receivers, m_findings);
+    try {
+        storage::exportCals(storageContext(), m_receivers, m_findings);
+    } catch (...) {
+        m_writeFailures.report(platform::currentErrorText());
+    }
+}
+
+storage::StorageContext CTarvexDlg::storageContext() {
+    return {*m_proxy,   m_services.ui, m_services.clock, m_services.paths,
+            m_flashLog, &m_backups,    &m_writeFailures};
 }
 
 void CTarvexDlg::setRunEnabled(bool enabled) {
@@ -201,6 +226,9 @@ void CTarvexDlg::startWorker(const std::vector<std::string>& receivers) {
         .notices = m_notices,
         .workingDirectory = m_services.workingDirectory,
         .flashLog = m_flashLog,
+        .backups = &m_backups,
+        .fileFailures = &m_writeFailures,
+        .historyDirectory = m_historyDirectory,
     });
     m_services.signals.workerRunning = true;
     m_workerThreadDone = false;

@@ -20,9 +20,12 @@
 #include "app/DialogServices.h"
 #include "app/DialogView.h"
 #include "app/UiTaskQueue.h"
+#include "app/WriteFailureReport.h"
 #include "config/T3872Acomcal.h"
 #include "storage/CatalogFindings.h"
 #include "storage/FlashCommandLog.h"
+#include "storage/StorageContext.h"
+#include "storage/StoredBackups.h"
 
 class CNetworkAnalyzer;
 namespace engine {
@@ -94,6 +97,13 @@ class CTarvexDlg {
     // Some run since the dialog opened ended on an error or an abort, so it did not store
     // everything it measured.
     bool anyRunFailed() const { return m_anyRunFailed.load(); }
+    // Some file the dialog or a run wrote whole could not be written (reported in the log
+    // and an "Error" box).
+    bool anyWriteFailed() const { return m_writeFailures.anyFailed(); }
+    // Where this dialog keeps backups of what it erases or replaces, and earlier attempts'
+    // raw files.
+    const storage::StoredBackups& backups() const { return m_backups; }
+    const std::filesystem::path& historyDirectory() const { return m_historyDirectory; }
 
   private:
     struct RunRequest;
@@ -120,6 +130,11 @@ class CTarvexDlg {
     void eraseCal(const std::string& receiver);
     void startSecondPart();
 
+    storage::StorageContext storageContext();
+    // The receivers erased since start-up and not characterized again, with a log line each
+    // saying where its backup is.
+    std::vector<std::string> erasedNotStoredAgain();
+
     void startWorker(const std::vector<std::string>& receivers);
     // Waits for the worker thread to finish, running the UI work it hands in meanwhile.
     void joinWorker();
@@ -145,6 +160,9 @@ class CTarvexDlg {
     storage::FlashCommandLog m_flashLog;
     std::string m_searchMode;
     storage::CatalogFindings m_findings;
+    storage::StoredBackups m_backups;
+    WriteFailureReport m_writeFailures;
+    std::filesystem::path m_historyDirectory;
 
     bool m_exitRequested = false;
     bool m_closeRequested = false;

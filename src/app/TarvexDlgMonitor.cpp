@@ -54,16 +54,48 @@ void CTarvexDlg::onExit() {
             missing += (missing.empty() ? "" : ", ") + receiver;
         }
     }
-    if (!missing.empty()) {
+    std::string erased;
+    for (const auto& receiver : erasedNotStoredAgain()) {
+        erased += (erased.empty() ? "" : ", ") + receiver;
+    }
+    if (!missing.empty() || !erased.empty()) {
+        std::string text;
+        if (!missing.empty()) {
+            text += "You have not successfully calibrated receiver(s): " + missing + "\n";
+        }
+        if (!erased.empty()) {
+            text +=
+                "Erased and not characterized again, so the analyzer now holds no "
+                "characterization for receiver(s): " +
+                erased + " (the log says where their backups are)\n";
+        }
         const auto answer = m_services.ui.messageBox(
-            {"You have not successfully calibrated receiver(s): " + missing +
-                 "\nDo you really want to exit now?",
-             "Exit without finishing cal?", platform::Buttons::YesNo, platform::BoxSystemModal});
+            {text + "Do you really want to exit now?", "Exit without finishing cal?",
+             platform::Buttons::YesNo, platform::BoxSystemModal});
         if (answer != platform::Answer::Yes) {
             return;
         }
     }
     endDialog();
+}
+
+std::vector<std::string> CTarvexDlg::erasedNotStoredAgain() {
+    std::vector<std::string> erased;
+    const auto saved = m_backups.latest();
+    for (const auto& receiver : m_receivers) {
+        const auto state = m_findings.find(receiver);
+        if (state == m_findings.end() || state->second != storage::kCatalogErased) {
+            continue;
+        }
+        erased.push_back(receiver);
+        const auto folder = saved.find(receiver);
+        m_notices.postnotice("Erased and not characterized again: " + receiver +
+                             (folder == saved.end()
+                                  ? std::string("; nothing was stored, so there is no backup")
+                                  : "; its backup is in " + folder->second.string()) +
+                             "\r\n");
+    }
+    return erased;
 }
 
 void CTarvexDlg::onTimer() {

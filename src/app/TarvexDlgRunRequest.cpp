@@ -6,6 +6,7 @@
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "app/CTarvexDlg.h"
 #include "engine/RunContext.h"
+#include "platform/ErrorText.h"
 #include "storage/DataFile.h"
 #include "storage/EraseCal.h"
 #include "storage/ExportCals.h"
@@ -217,6 +218,22 @@ bool CTarvexDlg::askErase(RunRequest& request) {
         request.stop = true;
         return false;
     }
+    // Nothing is erased unless all of it is saved first.
+    try {
+        const auto folder =
+            m_backups.save(storageContext(), request.eraseList, storage::BackupReason::Erase);
+        if (!folder.empty()) {
+            m_notices.postnotice("Backup of the characterizations to be erased saved in " +
+                                 folder.string() + "\r\n");
+        }
+    } catch (...) {
+        const std::string text = platform::currentErrorText();
+        m_notices.postnotice(text + "\r\n");
+        m_services.ui.messageBox(
+            {text, "Error", platform::Buttons::Ok, kSystemModal | platform::BoxTopmost});
+        request.stop = true;
+        return false;
+    }
     for (const auto& receiver : request.eraseList) {
         eraseCal(receiver);
     }
@@ -247,15 +264,11 @@ void CTarvexDlg::startRun(const std::vector<std::string>& receivers) {
 }
 
 void CTarvexDlg::reloadFromFlash() {
-    storage::StorageContext context{*m_proxy, m_services.ui, m_services.clock, m_services.paths,
-                                    m_flashLog};
-    storage::reloadFromFlash(context, m_needsPreparation);
+    storage::reloadFromFlash(storageContext(), m_needsPreparation);
 }
 
 void CTarvexDlg::eraseCal(const std::string& receiver) {
-    storage::StorageContext context{*m_proxy, m_services.ui, m_services.clock, m_services.paths,
-                                    m_flashLog};
-    storage::eraseCal(context, m_services.processes, receiver, m_findings);
+    storage::eraseCal(storageContext(), m_services.processes, receiver, m_findings);
 }
 
 }  // namespace app

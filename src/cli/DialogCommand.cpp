@@ -12,6 +12,7 @@
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
 #include "cli/GuiCommand.h"
+#include "cli/WorkFolderLock.h"
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "platform/RunSignals.h"
 #include "sim/SimulatedAnalyzer.h"
@@ -34,7 +35,12 @@ go to standard output.
 
 Exit status: 0 the dialog ended by Exit or Close and every run finished, 1 an error
 ended the dialog, 3 it ended normally but a run ended on an error ("Error in Cal") or was
-aborted, 4 a box had no answer (its caption and text on stderr).
+aborted, or a file could not be written (named in the log and an "Error" box), 4 a box had
+no answer (its caption and text on stderr).
+
+Before a stored characterization is erased or replaced it is saved under backups/ in the
+working directory (rcvrchar backups, rcvrchar restore); earlier attempts' raw files go to
+history/.
 
 Example:
   printf 'clear\nselect R1,A\nrun\nwait\n' |
@@ -66,6 +72,7 @@ struct DialogOptions {
 };
 
 int runDialog(const DialogOptions& options) {
+    const cli::WorkFolderLocks locks(options.analyzer, "the dialog");
     if (options.gui) {
         return cli::runGuiDialog(options.analyzer);
     }

@@ -7,6 +7,7 @@
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
+#include "cli/WorkFolderLock.h"
 #include "platform/ScriptedOperatorUi.h"
 #include "storage/ExportCals.h"
 #include "storage/FlashCatalog.h"
@@ -28,6 +29,7 @@ std::vector<std::string> allReceivers(bool millimetreWave) {
 }
 
 int exportStored(const cli::AnalyzerOptions& options) {
+    const cli::WorkFolderLocks locks(options, "export");
     cli::AnalyzerSession session(options);
     // No operator: any box the analyzer raises ends the command with its text.
     platform::ScriptedOperatorUi ui;

@@ -2,7 +2,6 @@
 // rebuilding the band plan and ladder from the configuration as a run would, and writes the
 // raw result file and the image.
 
-#include <fstream>
 #include <iostream>
 
 #include "cli/CommandRegistry.h"
@@ -12,6 +11,7 @@
 #include "engine/MeasuredDataImport.h"
 #include "engine/TestParameters.h"
 #include "platform/ScriptedOperatorUi.h"
+#include "platform/WholeFile.h"
 #include "storage/ReceiverNames.h"
 #include "storage/ResultProcessing.h"
 
@@ -82,13 +82,11 @@ int reprocess(const ReprocessOptions& options) {
     const auto judgement = storage::judgeResults(store, shortName, options.mmwave,
                                                  out / ("rcvrCharRaw_" + shortName + ".txt"), ui);
     if (judgement.accepted) {
-        const auto imagePath = out / ("RcvrChar_" + shortName + ".dat");
-        std::ofstream image(imagePath, std::ios::binary | std::ios::trunc);
-        const std::string bytes = judgement.image.bytes();
-        if (!image.write(bytes.data(), static_cast<std::streamsize>(bytes.size())) ||
-            !image.flush()) {
-            throw std::string("Cannot write the image " + imagePath.string());
-        }
+        const std::string name = "RcvrChar_" + shortName + ".dat";
+        platform::writeWholeFile(out / name, judgement.image.bytes(), "the image " + name);
+    }
+    if (!judgement.rawFileError.empty()) {
+        throw judgement.rawFileError;
     }
     if (judgement.passed) {
         return 0;

@@ -9,6 +9,7 @@
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
 #include "cli/ScenarioLinkFaults.h"
+#include "cli/WorkFolderLock.h"
 #include "lan/Portmapper.h"
 #include "lan/RawSocketServer.h"
 #include "lan/Vxi11.h"
@@ -48,6 +49,9 @@ int serve(ServeOptions options) {
         options.analyzer.analyzer = "sim:" + options.scenario;
     }
     const auto address = listenAddress(options.listen);
+    // The server writes nothing in the working folder, only in the simulator's state.
+    const cli::WorkFolderLocks locks(options.analyzer, "serve",
+                                     cli::WorkFolderLocks::Scope::StateOnly);
     cli::AnalyzerSession session(options.analyzer);
     if (!session.simulator()) {
         throw std::string("serve puts the simulated analyzer on the network; --analyzer " +

@@ -2,16 +2,49 @@
 
 #include "analyzer/NetworkAnalyzerClass.h"
 #include "config/NAData.h"
+#include "engine/AttemptHistory.h"
 #include "engine/CompressionData.h"
 #include "engine/SegmentSweep.h"
 #include "engine/TestParameters.h"
 #include "platform/ErrorText.h"
+#include "storage/FileFailures.h"
 #include "storage/ReceiverNames.h"
 #include "storage/ResultProcessing.h"
 
 namespace engine {
 
 namespace {
+
+// A raw file that cannot be written is reported and the run goes on: the characterization it
+// comes with is still right. Without anyone to tell, the run ends on it.
+void reportOrRaise(RunContext& context, const std::string& text) {
+    if (!context.fileFailures) {
+        throw text;
+    }
+    context.fileFailures->report(text);
+}
+
+// Writes the raw measured data after moving the earlier attempt's raw files aside.
+void writeRawFiles(RunContext& context, const CCompressionData& store,
+                   const std::string& shortName) {
+    if (!context.historyDirectory.empty()) {
+        for (const auto& file :
+             {context.workingDirectory / CCompressionData::measuredDataFileName(shortName),
+              context.paths.toLocal(storage::rawResultFileName(shortName))}) {
+            try {
+                keepEarlierAttempt(file, context.historyDirectory);
+            } catch (...) {
+                reportOrRaise(
+                    context, platform::currentErrorText() + "; the new attempt's file replaces it");
+            }
+        }
+    }
+    try {
+        store.writeAllMeasuredData(shortName, context.workingDirectory);
+    } catch (...) {
+        reportOrRaise(context, platform::currentErrorText());
+    }
+}
 
 struct Segment {
     int first;
@@ -69,7 +102,7 @@ bool characterizeReceiver(RunContext& context, SweepContext& sweep,
     const std::string shortName = storage::shortReceiverName(name);
     context.notices.postnotice("Writing Cal File\r\n");
     context.notices.postnotice(".\r\n");
-    store.writeAllMeasuredData(shortName, context.workingDirectory);
+    writeRawFiles(context, store, shortName);
     const bool accepted =
         storage::processResults(storage, store, shortName, setup.searchMode, true);
     if (accepted) {
@@ -96,8 +129,9 @@ void runReceivers(RunContext& context) {
 
     SweepContext sweep{context.proxy, context.configuration, store,           context.ui,
                        context.clock, context.signals,       context.notices, context.connection};
-    storage::StorageContext storage{context.proxy, context.ui, context.clock, context.paths,
-                                    context.flashLog};
+    storage::StorageContext storage{context.proxy,       context.ui,       context.clock,
+                                    context.paths,       context.flashLog, context.backups,
+                                    context.fileFailures};
     for (std::size_t i = 0; i < context.receivers.size();) {
         if (characterizeReceiver(context, sweep, storage, constants, context.receivers[i])) {
             ++i;

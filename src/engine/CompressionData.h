@@ -35,8 +35,9 @@ class CCompressionData final : public storage::MeasuredResults {
     void setNarrowbandAtten(const std::string& atten) { m_narrowbandAtten = atten; }
     const std::string& getNarrowbandAtten() const override { return m_narrowbandAtten; }
 
-    // Raw export of every trace to directory/"RcvrChar_AllMeasuredData_<tag>.csv". A file that
-    // cannot be opened is skipped: the export is a by-product of the run.
+    // Raw export of every trace to directory/"RcvrChar_AllMeasuredData_<tag>.csv", replacing
+    // the earlier file only when complete. Raises an error text naming the file and the reason
+    // when it cannot be written; the earlier file is then unchanged.
     void writeAllMeasuredData(const std::string& tag, const std::filesystem::path& directory) const;
     static std::string measuredDataFileName(const std::string& tag);
 

@@ -1,12 +1,11 @@
 #include <algorithm>
-#include <cstdio>
 #include <deque>
 #include <future>
-#include <memory>
 #include <vector>
 
 #include "engine/CompressionData.h"
 #include "platform/NumberText.h"
+#include "platform/WholeFile.h"
 
 namespace engine {
 
@@ -15,10 +14,6 @@ std::string CCompressionData::measuredDataFileName(const std::string& tag) {
 }
 
 namespace {
-
-struct FileCloser {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
 
 // One row of a table as the export reads it: a short row repeats its last reading, a missing
 // or empty row reads as 0.
@@ -93,18 +88,15 @@ LinesText formatLines(const std::vector<double>& frequencies,
 
 void CCompressionData::writeAllMeasuredData(const std::string& tag,
                                             const std::filesystem::path& directory) const {
-    std::unique_ptr<std::FILE, FileCloser> file(
-        std::fopen((directory / measuredDataFileName(tag)).c_str(), "wb"));
-    if (!file) {
-        return;
-    }
+    const std::string name = measuredDataFileName(tag);
+    platform::WholeFile file(directory / name, "the raw measured data " + name);
     std::string header = "Freq";
     for (double power : m_powerLevels) {
         const std::string p = platform::generalText(power, 6);
         header += ",Rec Pow(" + p + "),Mag(" + p + "),Phase(" + p + ")";
     }
     header += '\n';
-    std::fwrite(header.data(), 1, header.size(), file.get());
+    file.write(header);
 
     const std::size_t rows = m_ratioMag.size();
     std::vector<RowReadings> readings;  // per level: test, ratio, phase
@@ -125,8 +117,8 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     const auto writeOldest = [&] {
         LinesText text = formatting.front().get();
         formatting.pop_front();
-        std::fwrite(text.bytes.data(), 1, text.size, file.get());
         spare.push_back(std::move(text.bytes));
+        file.write(std::string_view(spare.back().data(), text.size));
     };
     for (std::size_t first = 0; first < n; first += chunkRows) {
         const std::size_t end = std::min(n, first + chunkRows);
@@ -146,6 +138,7 @@ void CCompressionData::writeAllMeasuredData(const std::string& tag,
     while (!formatting.empty()) {
         writeOldest();
     }
+    file.commit();
 }
 
 }  // namespace engine

@@ -17,8 +17,10 @@
 class CNetworkAnalyzer;
 class CNAData;
 namespace storage {
+class FileFailures;
 class FlashCommandLog;
-}
+class StoredBackups;
+}  // namespace storage
 
 namespace engine {
 
@@ -41,6 +43,13 @@ struct RunContext {
     std::filesystem::path workingDirectory;
     storage::FlashCommandLog& flashLog;
     RememberedConnection& connection = RememberedConnection::processWide();
+    // Saves what is stored before a store replaces it; none: nothing is saved.
+    storage::StoredBackups* backups = nullptr;
+    // Told of raw files that could not be written; none: the failure ends the run.
+    storage::FileFailures* fileFailures = nullptr;
+    // Where a receiver's earlier raw files go before a new attempt writes its own; empty:
+    // they are replaced.
+    std::filesystem::path historyDirectory{};
 };
 
 }  // namespace engine

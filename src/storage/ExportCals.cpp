@@ -1,9 +1,8 @@
 #include "storage/ExportCals.h"
 
-#include <cerrno>
-#include <cstring>
-#include <fstream>
+#include <sstream>
 
+#include "platform/WholeFile.h"
 #include "storage/ExportText.h"
 #include "storage/StoredImage.h"
 
@@ -36,14 +35,10 @@ ExportResult exportStoredCals(const StorageContext& context,
             break;
         }
         std::string name = "RcvrChar_" + flashName(receiver) + "_Exported.txt";
-        auto local = context.paths.toLocal(name);
-        std::ofstream out(local, std::ios::binary | std::ios::trunc);
-        bool complete = out && writeExportText(out, image);
-        out.close();
-        if (!out) {
-            throw std::string("Cannot write the export file " + name + " (" + local.string() +
-                              "): " + std::strerror(errno));
-        }
+        std::ostringstream text;
+        const bool complete = writeExportText(text, image);
+        platform::writeWholeFile(context.paths.toLocal(name), text.str(),
+                                 "the export file " + name);
         result.files.push_back(name);
         if (!complete) {
             result.endedAt = receiver;

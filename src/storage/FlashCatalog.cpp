@@ -5,9 +5,11 @@
 #include <fstream>
 
 #include "config/Split.h"
+#include "platform/UpperCase.h"
 #include "storage/CatalogAge.h"
 #include "storage/PortDataFile.h"
 #include "storage/ReceiverNames.h"
+#include "storage/StoredImage.h"
 
 namespace storage {
 namespace {
@@ -84,6 +86,40 @@ int listingState(std::istream& listing, const std::string& fileName,
         return kCatalogNothing;
     }
     return catalogAge(fields[0], now);
+}
+
+std::optional<CatalogEntry> catalogEntry(const StorageContext& context,
+                                         platform::ProcessRunner& processes,
+                                         const std::string& receiver) {
+    CatalogEntry entry;
+    if (!context.analyzer.ismmwave()) {
+        const std::string wanted = "RCVRCHAR\\" + platform::upperCased(flashName(receiver));
+        for (const auto& line : splitTokens(context.analyzer.flashcatalog(), '\n')) {
+            auto fields = splitTokens(line, ' ');
+            if (fields.size() >= 4 && platform::upperCased(fields[3]) == wanted) {
+                entry.date = fields[0] + " " + fields[1];
+                entry.bytes = std::strtoull(fields[2].c_str(), nullptr, 10);
+                return entry.bytes == 0 ? std::nullopt : std::optional(entry);
+            }
+        }
+        return std::nullopt;
+    }
+    auto file = findPortDataFile(context.analyzer.readmodel(false), receiver);
+    if (!file) {
+        return std::nullopt;
+    }
+    const auto listingPath = context.paths.toLocal(kListingFile);
+    std::error_code ignored;
+    std::filesystem::remove(listingPath, ignored);
+    processes.runCommand("dir /-C \"" + file->path + "\" > " + kListingFile);
+    std::ifstream listing(listingPath, std::ios::binary);
+    auto fields = splitTokens(listingLineFor(listing, file->fileName), ' ');
+    if (fields.size() < 4) {
+        return std::nullopt;
+    }
+    entry.date = fields[0] + " " + fields[1] + " " + fields[2];
+    entry.bytes = std::strtoull(fields[3].c_str(), nullptr, 10);
+    return entry.bytes == 0 ? std::nullopt : std::optional(entry);
 }
 
 void catalogFlash(const StorageContext& context, platform::ProcessRunner& processes,

@@ -5,7 +5,9 @@
 // listing of each receiver's per-port data file.
 
 #include <chrono>
+#include <cstdint>
 #include <istream>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -32,5 +34,18 @@ void applyCatalogReply(const std::string& reply, const std::vector<std::string>&
 // characters end the reading.
 int listingState(std::istream& listing, const std::string& fileName,
                  std::chrono::system_clock::time_point now);
+
+// What the catalog tells of one receiver's stored characterization.
+struct CatalogEntry {
+    std::string date;         // as the catalog or the listing writes it, time included
+    std::uint64_t bytes = 0;  // size of the stored data
+};
+
+// The flash catalog's line for the receiver's calibration (exact name, any case), or on
+// millimetre-wave systems the directory listing of its per-port data file (through
+// "fileInfo.txt", as catalogFlash). Nothing when nothing is stored or the size is zero.
+std::optional<CatalogEntry> catalogEntry(const StorageContext& context,
+                                         platform::ProcessRunner& processes,
+                                         const std::string& receiver);
 
 }  // namespace storage

@@ -2,14 +2,17 @@
 
 #include <array>
 #include <cmath>
-#include <cstdio>
 #include <cstdlib>
 #include <memory>
 
 #include "engine/CompressionData.h"
+#include "platform/ErrorText.h"
 #include "platform/NumberText.h"
+#include "platform/WholeFile.h"
+#include "storage/FileFailures.h"
 #include "storage/FlashTransfer.h"
 #include "storage/ReceiverNames.h"
+#include "storage/StoredBackups.h"
 
 namespace storage {
 
@@ -18,24 +21,26 @@ namespace {
 constexpr std::array<float, kCompressionLevels> kLevels = {0.05f, 0.1f, 0.2f, 0.5f};
 constexpr std::array<float, kCompressionLevels> kTolerances = {0.006f, 0.008f, 0.01f, 0.01f};
 
-struct FileCloser {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
-
-// The raw result text, buffered and written in blocks.
+// The raw result text, buffered and written in blocks to a file that replaces the earlier one
+// only when complete. A failure stops the writing and is kept for finish().
 class RawResultWriter {
   public:
     explicit RawResultWriter(const std::optional<std::filesystem::path>& path) {
         if (path) {
-            m_file.reset(std::fopen(path->c_str(), "wb"));
+            try {
+                m_file = std::make_unique<platform::WholeFile>(
+                    *path, "the raw result file " + path->filename().string());
+            } catch (...) {
+                m_error = platform::currentErrorText();
+            }
         }
         m_text.reserve(kFlushAt + 1024);
     }
-    ~RawResultWriter() { flush(); }
     RawResultWriter(const RawResultWriter&) = delete;
     RawResultWriter& operator=(const RawResultWriter&) = delete;
 
-    bool on() const { return m_file != nullptr; }
+    // Whether the text is wanted: a file was asked for, even if it has failed since.
+    bool on() const { return m_file != nullptr || !m_error.empty(); }
     void text(std::string_view text) { m_text += text; }
     void number(double value, int digits) { platform::appendGeneral(m_text, value, digits); }
     void reading(float value) { platform::appendFloat8(m_text, value); }
@@ -44,16 +49,35 @@ class RawResultWriter {
             flush();
         }
     }
+    // Writes the rest and puts the file in place; returns why it could not be, or empty.
+    std::string finish() {
+        flush();
+        if (m_file) {
+            try {
+                m_file->commit();
+            } catch (...) {
+                m_error = platform::currentErrorText();
+            }
+            m_file.reset();
+        }
+        return m_error;
+    }
 
   private:
     static constexpr std::size_t kFlushAt = 1 << 20;
     void flush() {
         if (m_file) {
-            std::fwrite(m_text.data(), 1, m_text.size(), m_file.get());
+            try {
+                m_file->write(m_text);
+            } catch (...) {
+                m_error = platform::currentErrorText();
+                m_file.reset();
+            }
         }
         m_text.clear();
     }
-    std::unique_ptr<std::FILE, FileCloser> m_file;
+    std::unique_ptr<platform::WholeFile> m_file;
+    std::string m_error;
     std::string m_text;
 };
 
@@ -159,7 +183,8 @@ std::string rawResultFileName(const std::string& receiver) {
 
 namespace {
 
-// Builds the image and the raw result file; the raw file is closed on return.
+// Builds the image and the raw result file; the raw file is in place on return, or its
+// failure is in the result.
 Judgement buildImage(MeasuredResults& store, const std::string& name, bool mmwave,
                      const std::optional<std::filesystem::path>& rawFile) {
     const auto& frequencies = store.getFrequencies();
@@ -216,6 +241,7 @@ Judgement buildImage(MeasuredResults& store, const std::string& name, bool mmwav
         previous = points;
         raw.endBlock();
     }
+    result.rawFileError = raw.finish();
     return result;
 }
 
@@ -255,8 +281,17 @@ bool processResults(StorageContext& context, MeasuredResults& store, const std::
     }
     const bool mmwave = context.analyzer.ismmwave();
     Judgement judgement = judgeResults(store, name, mmwave, rawPath, context.ui);
+    if (!judgement.rawFileError.empty()) {
+        if (!context.fileFailures) {
+            throw judgement.rawFileError;
+        }
+        context.fileFailures->report(judgement.rawFileError);
+    }
     if (!judgement.accepted) {
         return false;
+    }
+    if (context.backups) {
+        context.backups->save(context, {name}, BackupReason::Overwrite);
     }
     if (mmwave) {
         pushPortFile(context, name, judgement.image);

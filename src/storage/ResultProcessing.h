@@ -21,6 +21,9 @@ struct Judgement {
     bool passed = true;
     // False when the operator chose to retest: the image is not to be stored.
     bool accepted = true;
+    // Why the raw result file could not be written; empty when it was, or none was asked for.
+    // The earlier file of that name is then unchanged.
+    std::string rawFileError;
 };
 
 // Steps up to the operator's decision, without an analyzer. mmwave stops the records at the
@@ -34,7 +37,9 @@ Judgement judgeResults(MeasuredResults& store, const std::string& receiver, bool
 
 // The whole step: judges (raw file ".\rcvrCharRaw_<name>.txt" when rawFile is set), stores the
 // accepted image (per-port file on millimetre-wave systems, flash otherwise) and makes the
-// analyzer load it. Returns false when the operator chose to retest (nothing stored).
+// analyzer load it. Returns false when the operator chose to retest (nothing stored). A raw
+// file that cannot be written goes to context.fileFailures (raised without one); what is
+// stored is first saved through context.backups, whose failure stops the step.
 // searchMode is not used.
 bool processResults(StorageContext& context, MeasuredResults& store, const std::string& receiver,
                     const std::string& searchMode, bool rawFile);

@@ -11,12 +11,20 @@
 
 namespace storage {
 
+class FileFailures;
+class StoredBackups;
+
 struct StorageContext {
     CNetworkAnalyzer& analyzer;
     platform::OperatorUi& ui;
     platform::Clock& clock;
     const platform::PathMap& paths;
     FlashCommandLog& log;
+    // Saves what is stored before it is replaced; none: nothing is saved (tools and tests that
+    // work below the dialog).
+    StoredBackups* backups = nullptr;
+    // Told of whole-file writes that failed; none: the failure is raised instead.
+    FileFailures* fileFailures = nullptr;
 };
 
 }  // namespace storage

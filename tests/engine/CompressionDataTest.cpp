@@ -131,8 +131,14 @@ TEST(MeasuredDataExport, WritesHeaderPrecisionsAndRepeatsShortRows) {
     EXPECT_EQ(text.back(), '\n');
     EXPECT_EQ(text.find('\r'), std::string::npos);
 
-    // An unwritable place is skipped without an error.
-    EXPECT_NO_THROW(store.writeAllMeasuredData("A", dir / "missing" / "deeper"));
+    // An unwritable place is an error naming the file; the run reports it and goes on.
+    const std::string error =
+        testsupport::errorOf([&] { store.writeAllMeasuredData("A", dir / "missing" / "deeper"); });
+    EXPECT_EQ(error.rfind("Cannot write the raw measured data RcvrChar_AllMeasuredData_A.csv (" +
+                              (dir / "missing" / "deeper").string(),
+                          0),
+              0u)
+        << error;
 }
 
 TEST(MeasuredDataExport, ManyFrequenciesKeepEveryReadingInItsColumn) {

@@ -344,3 +344,40 @@ TEST(QtMainWindow, BadDataDialogRetestShowsPleaseNoteAndMeasuresAgain) {
 }
 
 }  // namespace
+
+TEST(QtMainWindow, ARawFileThatCannotBeWrittenIsAnErrorBoxAndStatusThree) {
+    qttest::WindowBench bench;
+    // A folder where the CSV's partial file must go: the write fails whatever the user.
+    std::filesystem::create_directory(bench.workDir() / "RcvrChar_AllMeasuredData_R1.csv.partial");
+    qttest::WindowOperator op;
+    op.answerBoxesByDefault();
+    QString log;
+    runWindow(
+        bench, op,
+        [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
+            whenIdle(op, w, [&] { runOnly(w, {"R1"}); });
+            op.then(
+                "the completion notice",
+                [&] {
+                    return idle(w) &&
+                           logOf(w).contains("All requested cals complete, click Exit to apply.");
+                },
+                [&] {
+                    log = logOf(w);
+                    click(w, 1);
+                });
+        },
+        app::CTarvexApp::exitRunFailed);
+    expectInOrder(op.captions(), {"Connections", "Error"});
+    for (const auto& box : op.seen()) {
+        if (box.caption == "Error") {
+            EXPECT_TRUE(box.fromWorker);
+            EXPECT_TRUE(
+                box.text.startsWith("Cannot write the raw measured data "
+                                    "RcvrChar_AllMeasuredData_R1.csv ("))
+                << box.text.toStdString();
+        }
+    }
+    EXPECT_TRUE(log.contains("File not written: Cannot write the raw measured data"));
+    EXPECT_TRUE(log.contains("Cal Complete\n"));
+}

@@ -38,7 +38,8 @@ std::string dataFile(int port, const char* file) {
 void expectRefused(SimBench& bench, const std::string& text, const std::string& path,
                    const std::string& reason) {
     EXPECT_EQ(text, "Cannot write the characterization data file " + path + " (" +
-                        bench.local(path).string() + "): " + reason);
+                        bench.local(path).string() + "): " + reason +
+                        "; any earlier file of that name is left as it was");
     EXPECT_FALSE(std::filesystem::exists(bench.local(path + ".partial")));
     EXPECT_TRUE(bench.commands().empty());
 }

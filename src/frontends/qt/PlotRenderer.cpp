@@ -8,6 +8,9 @@
 #include <QSvgGenerator>
 #include <algorithm>
 #include <cctype>
+#include <system_error>
+
+#include "platform/WholeFile.h"
 
 namespace qtui {
 
@@ -53,7 +56,9 @@ void renderChartToFile(QChart& chart, const std::filesystem::path& output, QSize
     scene.addItem(&chart);
     chart.setGeometry(QRectF(QPointF(0, 0), size));
     chart.layout()->activate();
-    const QString fileName = QString::fromStdString(output.string());
+    // Drawn beside the output and renamed over it, so that a failed plot leaves an earlier one.
+    const auto partial = platform::WholeFile::partialPath(output);
+    const QString fileName = QString::fromStdString(partial.string());
     bool written = false;
     if (ext == ".svg") {
         QSvgGenerator generator;
@@ -76,8 +81,15 @@ void renderChartToFile(QChart& chart, const std::filesystem::path& output, QSize
     }
     // The scene must not delete the chart, which belongs to the caller.
     scene.removeItem(&chart);
-    if (!written) {
-        throw std::string("Cannot write plot file " + output.string());
+    std::error_code ec;
+    if (written) {
+        std::filesystem::rename(partial, output, ec);
+    }
+    if (!written || ec) {
+        std::error_code ignored;
+        std::filesystem::remove(partial, ignored);
+        throw std::string("Cannot write plot file " + output.string() +
+                          (ec ? ": " + ec.message() : std::string()));
     }
 }
 
