@@ -8,6 +8,7 @@
 #include "analyzer/remote/RemoteDrive.h"
 #include "analyzer/remote/RemoteProcessRunner.h"
 #include "analyzer/remote/ResourceString.h"
+#include "analyzer/remote/Vxi11Transport.h"
 #include "sim/BenchHands.h"
 #include "sim/Scenario.h"
 #include "sim/SimProcessRunner.h"
@@ -97,18 +98,19 @@ AnalyzerSession::AnalyzerSession(const AnalyzerOptions& options)
     m_paths.mapDrive('C', m_simulator->driveRoot());
     m_processes = std::make_unique<sim::SimProcessRunner>(*m_simulator, m_paths);
     m_simulator->registerAsBackend();
+    m_identification = m_simulator->scenario().idn;
 }
 
 void AnalyzerSession::openLan(const AnalyzerOptions& options) {
     const remote::ResourceString resource = remote::parseResourceString(options.analyzer);
     const auto timeout = timeoutOf(options.timeout);
-    if (resource.kind != remote::ResourceString::Kind::Socket) {
-        throw std::string("The analyzer \"" + options.analyzer +
-                          "\" is a VXI-11 resource; this build reaches analyzers through "
-                          "TCPIP::HOST[::PORT]::SOCKET only");
+    std::unique_ptr<remote::Transport> transport;
+    if (resource.kind == remote::ResourceString::Kind::Socket) {
+        transport = std::make_unique<remote::RawSocketTransport>(resource, timeout);
+    } else {
+        transport = std::make_unique<remote::Vxi11Transport>(resource, timeout);
     }
-    m_link = std::make_shared<remote::ScpiLink>(
-        std::make_unique<remote::RawSocketTransport>(resource, timeout), timeout);
+    m_link = std::make_shared<remote::ScpiLink>(std::move(transport), timeout);
     if (!options.trace.empty()) {
         m_link->setTraceFile(options.trace);
     }

@@ -67,7 +67,7 @@ class AnalyzerSession {
     bool virtualClock() const { return m_virtualClock; }
     // The in-process simulator; nullptr for a LAN analyzer.
     sim::SimulatedAnalyzer* simulator() { return m_simulator.get(); }
-    // The connected LAN instrument's *IDN? reply; empty for the in-process simulator.
+    // The connected instrument's *IDN? reply (the in-process simulator's too).
     const std::string& identification() const { return m_identification; }
 
   private:

@@ -106,6 +106,7 @@ int runDialog(const DialogOptions& options) {
         signals,
         std::filesystem::current_path(),
         [&session](platform::OperatorUi& frontEnd) { return session.wrapUi(frontEnd); },
+        session.identification(),
     };
     int status = 0;
     if (scripted) {

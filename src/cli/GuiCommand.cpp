@@ -32,7 +32,8 @@ int runGuiDialog(const AnalyzerOptions& options) {
         .signals = signals,
         .workingDirectory = std::filesystem::current_path(),
         .wrapUi = [&session](platform::OperatorUi& frontEnd) { return session.wrapUi(frontEnd); },
-        .onWindow = nullptr};
+        .onWindow = nullptr,
+        .instrument = session.identification()};
     return qtui::runQtDialog(setup, std::cerr);
 #else
     (void)options;

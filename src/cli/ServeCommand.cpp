@@ -8,6 +8,7 @@
 
 #include "cli/AnalyzerOptions.h"
 #include "cli/CommandRegistry.h"
+#include "cli/ScenarioLinkFaults.h"
 #include "cli/WorkFolderLock.h"
 #include "lan/Portmapper.h"
 #include "lan/RawSocketServer.h"
@@ -56,11 +57,17 @@ int serve(ServeOptions options) {
         throw std::string("serve puts the simulated analyzer on the network; --analyzer " +
                           options.analyzer.analyzer + " is not the simulator");
     }
-    const auto device = session.simulator()->scpiDevice();
+    sim::SimulatedAnalyzer& simulator = *session.simulator();
+    const auto device = simulator.scpiDevice();
+    // Called on the execution thread, which owns the instrument.
+    cli::ScenarioLinkFaults faults(simulator.scenario().faults.link,
+                                   [&simulator] { simulator.restartApplication(); });
 
-    // Servers go before the context they run on, and the device after both.
+    // Servers go before the context they run on, and the device and faults after both.
     lan::ServerContext context(2);
-    lan::RawSocketServer raw(context, *device, {address, options.port});
+    lan::RawSocketServer::Options rawOptions;
+    rawOptions.faults = &faults;
+    lan::RawSocketServer raw(context, *device, {address, options.port}, rawOptions);
     std::optional<lan::Vxi11Server> vxi11;
     std::optional<lan::Portmapper> portmapper;
     if (options.vxi11) {

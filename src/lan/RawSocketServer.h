@@ -7,6 +7,7 @@
 #include <chrono>
 #include <cstdint>
 
+#include "lan/LinkFaults.h"
 #include "lan/TcpListener.h"
 #include "scpi/Block.h"
 #include "scpi/Device.h"
@@ -19,6 +20,8 @@ class RawSocketServer {
         // Input that is a whole message but lacks its NL runs after this much silence.
         std::chrono::milliseconds idleGap{200};
         std::size_t maxMessageBytes = scpi::maxBlockBytes + (1u << 20);
+        // Faults to show on purpose; it must outlive the server.
+        LinkFaults* faults = nullptr;
     };
 
     // Throws std::runtime_error naming the address when it cannot listen there.

@@ -1,6 +1,7 @@
 #include "sim/Scenario.h"
 
 #include <fstream>
+#include <limits>
 #include <nlohmann/json.hpp>
 #include <set>
 #include <sstream>
@@ -135,11 +136,104 @@ std::map<std::string, T> readReceiverMap(const Scenario& scenario, const json& v
     return result;
 }
 
+int readCount(const json& value, const std::string& key) {
+    const long n = readInteger(value, key);
+    if (n < 0 || n > std::numeric_limits<int>::max()) {
+        fail("\"" + key + "\" must be a count from 0 to " +
+             std::to_string(std::numeric_limits<int>::max()) + ", not " + std::to_string(n));
+    }
+    return static_cast<int>(n);
+}
+
+// A number of commands, or {"commands": N, "times": T}.
+LinkCount readLinkCount(const json& value, const std::string& key) {
+    LinkCount parsed;
+    if (value.is_object()) {
+        rejectUnknownKeys(value, {"commands", "times"}, key);
+        if (!value.contains("commands")) {
+            fail("\"" + key + "\" needs \"commands\"");
+        }
+        parsed.commands = readInteger(value["commands"], key + ".commands");
+        if (value.contains("times")) {
+            parsed.times = readCount(value["times"], key + ".times");
+        }
+    } else if (value.is_number_integer() || value.is_number_unsigned()) {
+        parsed.commands = readInteger(value, key);
+    } else {
+        fail("\"" + key + "\" must be an integer or an object, not " + typeName(value));
+    }
+    if (parsed.commands < 1) {
+        fail("\"" + key + "\" must count at least 1 command");
+    }
+    return parsed;
+}
+
+// One {"command": PREFIX, "times": T} or an array of them.
+std::vector<LinkRule> readLinkRules(const json& value, const std::string& key) {
+    const bool single = value.is_object();
+    if (!single && !value.is_array()) {
+        fail("\"" + key + "\" must be an object or an array, not " + typeName(value));
+    }
+    std::vector<LinkRule> rules;
+    for (std::size_t i = 0; i < (single ? 1 : value.size()); ++i) {
+        const json& rule = single ? value : value[i];
+        const std::string itemKey = single ? key : key + "[" + std::to_string(i) + "]";
+        expectObject(rule, itemKey);
+        rejectUnknownKeys(rule, {"command", "times"}, itemKey);
+        if (!rule.contains("command")) {
+            fail("\"" + itemKey + "\" needs \"command\"");
+        }
+        LinkRule parsed;
+        parsed.command = readString(rule["command"], itemKey + ".command");
+        if (parsed.command.find_first_not_of(" \t") == std::string::npos) {
+            fail("\"" + itemKey + ".command\" must not be empty");
+        }
+        if (rule.contains("times")) {
+            parsed.times = readCount(rule["times"], itemKey + ".times");
+        }
+        rules.push_back(std::move(parsed));
+    }
+    return rules;
+}
+
+void readLinkFaults(LinkFaultRules& link, const json& value) {
+    expectObject(value, "faults.link");
+    rejectUnknownKeys(value,
+                      {"drop_after_commands", "drop_mid_response_on", "stall_on", "garbage_on",
+                       "split_reply_ms", "restart_after_commands"},
+                      "faults.link");
+    if (value.contains("drop_after_commands")) {
+        link.dropAfterCommands =
+            readLinkCount(value["drop_after_commands"], "faults.link.drop_after_commands");
+    }
+    if (value.contains("restart_after_commands")) {
+        link.restartAfterCommands =
+            readLinkCount(value["restart_after_commands"], "faults.link.restart_after_commands");
+    }
+    if (value.contains("drop_mid_response_on")) {
+        link.dropMidResponseOn =
+            readLinkRules(value["drop_mid_response_on"], "faults.link.drop_mid_response_on");
+    }
+    if (value.contains("stall_on")) {
+        link.stallOn = readLinkRules(value["stall_on"], "faults.link.stall_on");
+    }
+    if (value.contains("garbage_on")) {
+        link.garbageOn = readLinkRules(value["garbage_on"], "faults.link.garbage_on");
+    }
+    if (value.contains("split_reply_ms")) {
+        link.splitReplyMs = readCount(value["split_reply_ms"], "faults.link.split_reply_ms");
+        if (link.splitReplyMs > 60000) {
+            fail("\"faults.link.split_reply_ms\" must be at most 60000, not " +
+                 std::to_string(link.splitReplyMs));
+        }
+    }
+}
+
 void readFaults(Scenario& scenario, const json& value) {
     expectObject(value, "faults");
     rejectUnknownKeys(value,
                       {"disconnected", "wrong_pad_db", "narrowband_loss_db", "attenuator_reply",
-                       "bad_data", "corrupt_flash_writes", "scpi_errors"},
+                       "bad_data", "corrupt_flash_writes", "scpi_errors", "link"},
                       "faults");
     auto count = [](const json& v, const std::string& k) {
         long n = readInteger(v, k);
@@ -205,6 +299,9 @@ void readFaults(Scenario& scenario, const json& value) {
             }
             f.scpiErrors.push_back(parsed);
         }
+    }
+    if (value.contains("link")) {
+        readLinkFaults(f.link, value["link"]);
     }
 }
 

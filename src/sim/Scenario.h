@@ -40,6 +40,30 @@ struct ScpiErrorRule {
     int times = 1;
 };
 
+// A link fault tied to messages that start with `command` (case-insensitive), for the first
+// `times` of them.
+struct LinkRule {
+    std::string command;
+    int times = 1;
+};
+
+// A link fault after every `commands` program messages the instrument has run, counted over
+// all clients, `times` times in all.
+struct LinkCount {
+    long commands = 0;
+    int times = 1;
+};
+
+// Faults of the network link of a served instrument; the in-process simulator ignores them.
+struct LinkFaultRules {
+    std::optional<LinkCount> dropAfterCommands;
+    std::vector<LinkRule> dropMidResponseOn;
+    std::vector<LinkRule> stallOn;
+    std::vector<LinkRule> garbageOn;
+    int splitReplyMs = 0;
+    std::optional<LinkCount> restartAfterCommands;
+};
+
 struct Faults {
     std::map<std::string, int> disconnected;
     std::map<std::string, double> wrongPadDb;
@@ -49,6 +73,7 @@ struct Faults {
     // Flash writes of the receiver's calibration that store one word wrong.
     std::map<std::string, int> corruptFlashWrites;
     std::vector<ScpiErrorRule> scpiErrors;
+    LinkFaultRules link;
 };
 
 struct Scenario {

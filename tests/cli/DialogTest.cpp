@@ -68,7 +68,9 @@ TEST_F(Dialog, StatusFourForAnUnansweredBoxAndOneForAnErrorBox) {
     const CommandRun missing =
         runRcvrchar(m_dir, "--analyzer " + scenario("default.json") + " --yes", "run\n");
     EXPECT_EQ(missing.status, 1);
-    EXPECT_EQ(missing.out, "[Error] CNAData::ReadSequence Can't open file RcvrChar.dat => OK\n");
+    EXPECT_EQ(missing.out,
+              "Analyzer: Velquor Technologies,T3872A,MY00000001,A.13.55.06\n"
+              "[Error] CNAData::ReadSequence Can't open file RcvrChar.dat => OK\n");
 }
 
 TEST_F(Dialog, BadCommandLinesAreRefusedWithTheReason) {

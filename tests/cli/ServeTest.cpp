@@ -191,3 +191,31 @@ TEST(Serve, TakenPortOrBadAddressIsAClearError) {
     EXPECT_EQ(bad.err, "--listen \"300.1.2.3\" is not an IP address\n");
     EXPECT_EQ(first.stop(SIGINT), 0);
 }
+
+// Each link fault of the scenario, met by pyvisa-py as the timeout or error a script sees,
+// while a second client is served as usual.
+TEST(ThreadedServe, PyvisaMeetsEachLinkFaultAndTheServerGoesOn) {
+    const std::vector<std::pair<std::string, std::string>> faults{
+        {"drop_after_commands", "2"},
+        {"drop_mid_response_on", R"({"command": "calc:data?"})"},
+        {"stall_on", R"({"command": "*IDN?"})"},
+        {"garbage_on", R"([{"command": "*idn?", "times": 1}])"},
+        {"split_reply_ms", "300"},
+        {"restart_after_commands", "3"},
+    };
+    for (const auto& [fault, value] : faults) {
+        SCOPED_TRACE(fault);
+        TempDir dir;
+        testsupport::writeFile(dir / "scenario.json",
+                               R"({"faults": {"link": {")" + fault + "\": " + value + "}}}");
+        ServeProcess server(dir, {"--port", "0", "--scenario", (dir / "scenario.json").string(),
+                                  "--sim-state", (dir / "state").string()});
+        const std::string resource = server.line();
+        ASSERT_TRUE(std::regex_match(resource, std::regex(R"(TCPIP::127\.0\.0\.1::\d+::SOCKET)")))
+            << resource;
+        EXPECT_EQ(shell("timeout 60 /usr/bin/python3 " + clients + "/pyvisa_link_fault.py " +
+                        fault + " '" + resource + "'"),
+                  fault + " seen as expected\n[exit 0]");
+        EXPECT_EQ(server.stop(SIGTERM), 0);
+    }
+}

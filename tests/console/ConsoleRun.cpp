@@ -62,6 +62,7 @@ console::ConsoleSetup ConsoleRun::makeSetup() {
         [this](platform::OperatorUi& frontEnd) -> std::shared_ptr<platform::OperatorUi> {
             return std::make_shared<sim::SimulatedBench>(frontEnd, *m_simulator);
         },
+        m_simulator->scenario().idn,
     };
 }
 

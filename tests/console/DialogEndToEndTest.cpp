@@ -252,19 +252,21 @@ TEST(ThreadedDialogBadData, TheThreeChoicesOfTheBadDataDialog) {
 TEST(DialogStartUp, MissingConfigurationEndsTheDialogWithItsErrorBox) {
     ConsoleRun run(ConsoleRun::defaultScenario(), false);
     EXPECT_EQ(run.run("run\n", "Error = OK\n"), 1);
-    EXPECT_EQ(run.out(), "[Error] CNAData::ReadSequence Can't open file RcvrChar.dat => OK\n");
+    // The connected instrument comes first, so that an error is seen beside it.
+    EXPECT_EQ(run.out(),
+              "Analyzer: Velquor Technologies,T3872A,MY00000001,A.13.55.06\n"
+              "[Error] CNAData::ReadSequence Can't open file RcvrChar.dat => OK\n");
 }
 
 TEST(DialogStartUp, AccessoriesFollowTheModelAndTheReferencePad) {
     {
         ConsoleRun run(ConsoleRun::scenarioFile("two-port.json"));
         ASSERT_EQ(run.runYes("exit\n"), 0) << run.err();
-        EXPECT_EQ(run.out().rfind("For this Characterization you will need:\n1)  RF cable with "
-                                  "3.5mm connectors (F-F or M-F)\n2)  3.5mm adapter (M-M), if "
-                                  "using F-F cable\n3) Short (4\") flex RF cable with 3.5mm "
-                                  "connectors (M-M)\n4) 3.5mm 10dB pad\n",
-                                  0),
-                  0u)
+        EXPECT_EQ(run.out().find("\nFor this Characterization you will need:\n1)  RF cable with "
+                                 "3.5mm connectors (F-F or M-F)\n2)  3.5mm adapter (M-M), if "
+                                 "using F-F cable\n3) Short (4\") flex RF cable with 3.5mm "
+                                 "connectors (M-M)\n4) 3.5mm 10dB pad\n"),
+                  run.out().find('\n'))
             << run.out();
     }
     {

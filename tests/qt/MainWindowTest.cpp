@@ -108,7 +108,8 @@ TEST(QtMainWindow, ControlsFollowTheTemplateAndSelectAllClearAllAndAboutWork) {
     QString aboutVersion;
     runWindow(bench, op, [&](qtui::QtFrontEndParts&, TarvexWindow& w) {
         whenIdle(op, w, [&] {
-            EXPECT_EQ(w.windowTitle(), "Receiver Characterization");
+            EXPECT_EQ(w.windowTitle().toStdString(),
+                      "Receiver Characterization - " + bench.simulator->scenario().idn);
             const qtui::DialogUnits du(w.font());
             EXPECT_EQ(w.size(), du.size(319, 202));
             EXPECT_EQ(w.palette().color(QPalette::Window), QColor(232, 232, 232));

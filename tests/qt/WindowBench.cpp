@@ -35,7 +35,8 @@ int WindowBench::run(std::function<void(qtui::QtFrontEndParts&)> onWindow) {
         .wrapUi = [this](platform::OperatorUi& qt) -> std::shared_ptr<platform::OperatorUi> {
             return std::make_shared<sim::SimulatedBench>(qt, *simulator);
         },
-        .onWindow = std::move(onWindow)};
+        .onWindow = std::move(onWindow),
+        .instrument = simulator->scenario().idn};
     std::ostringstream err;
     const int status = qtui::runQtDialog(setup, err);
     return status;

@@ -110,4 +110,49 @@ TEST(Scenario, ShippedScenarioFilesAreValid) {
     EXPECT_EQ("010,080", sim::Scenario::fromFile(folder / "default.json").options);
 }
 
+// Link faults: a count or a count with times; one prefix rule or an array of them.
+TEST(Scenario, ReadsLinkFaultsAndNamesWhatIsWrong) {
+    const auto s = sim::Scenario::fromJson(R"({"faults": {"link": {
+        "drop_after_commands": 7, "restart_after_commands": {"commands": 5, "times": 2},
+        "stall_on": {"command": "calc:data?"},
+        "garbage_on": [{"command": "*OPC?", "times": 3}, {"command": "MMEM:CAT?"}],
+        "drop_mid_response_on": [], "split_reply_ms": 40}}})");
+    const auto& link = s.faults.link;
+    ASSERT_TRUE(link.dropAfterCommands && link.restartAfterCommands);
+    EXPECT_EQ(link.dropAfterCommands->commands, 7);
+    EXPECT_EQ(link.dropAfterCommands->times, 1);
+    EXPECT_EQ(link.restartAfterCommands->commands, 5);
+    EXPECT_EQ(link.restartAfterCommands->times, 2);
+    ASSERT_EQ(link.stallOn.size(), 1u);
+    EXPECT_EQ(link.stallOn[0].command, "calc:data?");
+    ASSERT_EQ(link.garbageOn.size(), 2u);
+    EXPECT_EQ(link.garbageOn[0].times, 3);
+    EXPECT_EQ(link.garbageOn[1].command, "MMEM:CAT?");
+    EXPECT_TRUE(link.dropMidResponseOn.empty());
+    EXPECT_EQ(link.splitReplyMs, 40);
+
+    EXPECT_EQ("scenario: unknown key \"flaky\" in faults.link",
+              errorOf(R"({"faults": {"link": {"flaky": 1}}})"));
+    EXPECT_EQ("scenario: \"faults.link.drop_after_commands\" must count at least 1 command",
+              errorOf(R"({"faults": {"link": {"drop_after_commands": 0}}})"));
+    EXPECT_EQ(
+        "scenario: \"faults.link.restart_after_commands\" must be an integer or an object, not "
+        "a string",
+        errorOf(R"({"faults": {"link": {"restart_after_commands": "5"}}})"));
+    EXPECT_EQ("scenario: \"faults.link.stall_on[1]\" needs \"command\"",
+              errorOf(R"({"faults": {"link": {"stall_on": [{"command": "A"}, {"times": 1}]}}})"));
+    EXPECT_EQ("scenario: \"faults.link.garbage_on.command\" must not be empty",
+              errorOf(R"({"faults": {"link": {"garbage_on": {"command": " "}}}})"));
+    EXPECT_EQ(
+        "scenario: \"faults.link.stall_on.times\" must be a count from 0 to 2147483647, "
+        "not -1",
+        errorOf(R"({"faults": {"link": {"stall_on": {"command": "A", "times": -1}}}})"));
+    EXPECT_EQ("scenario: \"faults.link.split_reply_ms\" must be at most 60000, not 90000",
+              errorOf(R"({"faults": {"link": {"split_reply_ms": 90000}}})"));
+    EXPECT_EQ(
+        "scenario: \"faults.link.drop_mid_response_on\" must be an object or an array, "
+        "not an integer",
+        errorOf(R"({"faults": {"link": {"drop_mid_response_on": 3}}})"));
+}
+
 }  // namespace

@@ -14,6 +14,7 @@
 #include <functional>
 #include <memory>
 #include <ostream>
+#include <string>
 #include <vector>
 
 #include "frontends/console/AnswerBook.h"
@@ -36,6 +37,8 @@ struct ConsoleSetup {
     // Puts something between the console's boxes and the dialog (the simulated bench that
     // plays the operator's cabling); the console's own operator interface when empty.
     std::function<std::shared_ptr<platform::OperatorUi>(platform::OperatorUi& console)> wrapUi;
+    // The analyzer's *IDN? reply, the console's first line; nothing shown when empty.
+    std::string instrument;
 };
 
 // A retry question is answered Yes (bad data: Retest) at most maxRetries times for one

@@ -191,6 +191,9 @@ class InteractiveLoop {
 int runInteractive(ConsoleSetup& setup, LineSource& input, std::ostream& out, std::ostream& err,
                    std::atomic<bool>* closeRequested) {
     ConsoleOutput output(out, err);
+    if (!setup.instrument.empty()) {
+        output.write("Analyzer: " + setup.instrument + "\n");
+    }
     app::UiTaskQueue queue;
     InteractiveAnswerer answerer(output, queue, input);
     ConsoleSession session(setup, output, queue, answerer, true);

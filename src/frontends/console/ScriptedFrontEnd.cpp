@@ -107,6 +107,9 @@ class ScriptPlayer {
 int runScripted(ConsoleSetup& setup, const std::vector<ScriptLine>& script, AnswerBook answers,
                 std::ostream& out, std::ostream& err, int maxRetries) {
     ConsoleOutput output(out, err);
+    if (!setup.instrument.empty()) {
+        output.write("Analyzer: " + setup.instrument + "\n");
+    }
     app::UiTaskQueue queue;
     ScriptedAnswerer answerer(std::move(answers), output, maxRetries);
     ConsoleSession session(setup, output, queue, answerer, false);

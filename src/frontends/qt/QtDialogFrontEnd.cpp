@@ -98,6 +98,10 @@ int runQtDialog(QtSetup& setup, std::ostream& err) {
     }
     platform::OperatorUi& ui = wrapped ? *wrapped : qtUi;
     TarvexWindow window(queue);
+    if (!setup.instrument.empty()) {
+        window.setWindowTitle(window.windowTitle() + " - " +
+                              QString::fromStdString(setup.instrument));
+    }
     qtUi.setOwner(&window);
     CharacterizationWindow plots;
     QObject::connect(&window, &TarvexWindow::receiverCompleted, &plots,

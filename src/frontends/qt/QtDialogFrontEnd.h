@@ -42,6 +42,8 @@ struct QtSetup {
     // Called once the window exists, before the dialog initialises (tests drive it from
     // here; the executable leaves it empty).
     std::function<void(QtFrontEndParts& parts)> onWindow;
+    // The analyzer's *IDN? reply, shown in the window's title; the plain title when empty.
+    std::string instrument;
 };
 
 // Why no window can be opened here, or nothing when a display is available. Looks at
