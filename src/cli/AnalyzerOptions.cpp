@@ -3,12 +3,11 @@
 #include <cmath>
 
 #include "analyzer/automation/BackendFactory.h"
-#include "analyzer/remote/RawSocketTransport.h"
+#include "analyzer/remote/LanTransport.h"
 #include "analyzer/remote/RemoteApplication.h"
 #include "analyzer/remote/RemoteDrive.h"
 #include "analyzer/remote/RemoteProcessRunner.h"
 #include "analyzer/remote/ResourceString.h"
-#include "analyzer/remote/Vxi11Transport.h"
 #include "sim/BenchHands.h"
 #include "sim/Scenario.h"
 #include "sim/SimProcessRunner.h"
@@ -104,13 +103,8 @@ AnalyzerSession::AnalyzerSession(const AnalyzerOptions& options)
 void AnalyzerSession::openLan(const AnalyzerOptions& options) {
     const remote::ResourceString resource = remote::parseResourceString(options.analyzer);
     const auto timeout = timeoutOf(options.timeout);
-    std::unique_ptr<remote::Transport> transport;
-    if (resource.kind == remote::ResourceString::Kind::Socket) {
-        transport = std::make_unique<remote::RawSocketTransport>(resource, timeout);
-    } else {
-        transport = std::make_unique<remote::Vxi11Transport>(resource, timeout);
-    }
-    m_link = std::make_shared<remote::ScpiLink>(std::move(transport), timeout);
+    m_link =
+        std::make_shared<remote::ScpiLink>(remote::makeLanTransport(resource, timeout), timeout);
     if (!options.trace.empty()) {
         m_link->setTraceFile(options.trace);
     }

@@ -25,7 +25,7 @@ class Vxi11Client {
 
     // Asks the portmapper for the core channel, connects and creates the link. Every call
     // throws ClientError naming the host, the port and the step ("asking the portmapper on
-    // 192.0.2.7:111 for the VXI-11 core channel: connection refused"); the link is then
+    // vna-lab-3:111 for the VXI-11 core channel: connection refused"); the link is then
     // closed.
     void connect(std::chrono::milliseconds timeout);
     bool isOpen() const { return m_stream.isOpen(); }

@@ -20,9 +20,8 @@ TEST(ResourceString, SocketAndInstrForms) {
         {"tcpip0::analyzer-7.lab::socket", ResourceString::Kind::Socket, "analyzer-7.lab", 5025,
          "inst0"},
         {"TCPIP1::[::1]::6000::SOCKET", ResourceString::Kind::Socket, "::1", 6000, "inst0"},
-        {"TCPIP::192.0.2.7::INSTR", ResourceString::Kind::Vxi11, "192.0.2.7", 5025, "inst0"},
-        {"TCPIP::[fe80::1%eth0]::inst1::INSTR", ResourceString::Kind::Vxi11, "fe80::1%eth0", 5025,
-         "inst1"},
+        {"TCPIP::127.0.0.7::INSTR", ResourceString::Kind::Vxi11, "127.0.0.7", 5025, "inst0"},
+        {"TCPIP::[::1%lo]::inst1::INSTR", ResourceString::Kind::Vxi11, "::1%lo", 5025, "inst1"},
     };
     for (const auto& c : cases) {
         const ResourceString r = remote::parseResourceString(c.text);

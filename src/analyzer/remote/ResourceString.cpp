@@ -11,7 +11,7 @@ namespace remote {
 const char* const acceptedResourceForms =
     "TCPIP[n]::HOST[::PORT]::SOCKET (raw socket, PORT 5025 unless given) or "
     "TCPIP[n]::HOST[::DEVICE]::INSTR (VXI-11, DEVICE inst0 unless given); HOST is a name, an "
-    "IPv4 address or an IPv6 address in brackets, e.g. TCPIP::192.0.2.7::5025::SOCKET, "
+    "IPv4 address or an IPv6 address in brackets, e.g. TCPIP::127.0.0.1::5025::SOCKET, "
     "TCPIP0::[::1]::inst0::INSTR";
 
 namespace {
@@ -45,7 +45,7 @@ bool validHost(const std::string& host) {
         return false;
     }
     if (host.front() == '[') {
-        // An IPv6 address, with a zone after "%" (fe80::1%eth0).
+        // An IPv6 address, with a zone after "%" (::1%lo).
         return host.size() > 2 && host.back() == ']' &&
                std::all_of(host.begin() + 1, host.end() - 1, [](char c) {
                    return std::isalnum(static_cast<unsigned char>(c)) || c == ':' || c == '.' ||
