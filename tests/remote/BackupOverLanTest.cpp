@@ -5,30 +5,12 @@
 #include <gtest/gtest.h>
 
 #include "RunRcvrchar.h"
+#include "ServedSimulator.h"
 #include "TempDir.h"
-#include "lan/RawSocketServer.h"
-#include "lan/ServerContext.h"
-#include "sim/Scenario.h"
-#include "sim/SimulatedAnalyzer.h"
 
 namespace {
 
-struct ServedSimulator {
-    ServedSimulator(const std::filesystem::path& state, const std::string& scenario)
-        : analyzer(sim::Scenario::fromFile(scenario), state),
-          device(analyzer.scpiDevice()),
-          server(context, *device, {asio::ip::make_address("127.0.0.1"), 0}) {}
-    ~ServedSimulator() { context.stop(); }
-
-    std::string resource() const {
-        return "TCPIP::127.0.0.1::" + std::to_string(server.port()) + "::SOCKET";
-    }
-
-    lan::ServerContext context;
-    sim::SimulatedAnalyzer analyzer;
-    std::unique_ptr<scpi::Device> device;
-    lan::RawSocketServer server;
-};
+using remotetest::ServedSimulator;
 
 // Exports over the network; the text of the receiver's export file, or empty when the
 // analyzer holds none for it.

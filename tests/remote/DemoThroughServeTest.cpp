@@ -143,6 +143,14 @@ class DemoThroughServe : public ::testing::Test {
         };
         EXPECT_EQ(completed(out), 8u) << out;
         EXPECT_EQ(completed(out), completed(s_local->out));
+        // A restart program cannot run on the analyzer computer from here: the operator does it.
+        EXPECT_NE(out.find("[Restart the analyzer application] Restart the analyzer's "
+                           "measurement application so that it loads the new "
+                           "characterizations. => OK"),
+                  std::string::npos)
+            << out;
+        EXPECT_EQ(out.find("[Restart] Restarting TVA Application"), std::string::npos);
+        EXPECT_NE(s_local->out.find("[Restart] Restarting TVA Application"), std::string::npos);
 
         EXPECT_EQ(differences(filesUnder(dir / (kind + "-state") / "flash"),
                               filesUnder(dir / "local-state" / "flash")),
