@@ -2,11 +2,24 @@
 
 #include <sstream>
 
+#include "config/T3872Acomcal.h"
 #include "frontends/console/ConsoleFrontEnd.h"
 #include "sim/Scenario.h"
 #include "sim/SimulatedBench.h"
 
 namespace testsupport {
+
+long sampleRecordCount() {
+    CT3872Acomcal configuration;
+    configuration.SetModel("T3872A");
+    configuration.SetOptions({"010", "080"});
+    configuration.ReadSequence(sampleConfiguration().string());
+    long points = 0;
+    for (int band = 0; band <= static_cast<int>(configuration.GetConstant("maxband")); ++band) {
+        points += configuration.GetBandDefaults(band).m_points;
+    }
+    return points;
+}
 
 ConsoleRun::ConsoleRun(const std::string& scenario, bool withConfiguration)
     : m_previousDirectory(std::filesystem::current_path()),

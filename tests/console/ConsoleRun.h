@@ -18,6 +18,10 @@
 
 namespace testsupport {
 
+// Records of a characterization that matches the sample configuration's calibration points
+// for a T3872A with options 010 and 080.
+long sampleRecordCount();
+
 // Whether the parts occur in text in this order, each after the end of the one before.
 bool inOrder(const std::string& text, const std::vector<std::string>& expected);
 

@@ -5,24 +5,10 @@
 #include "app/CTarvexApp.h"
 
 #include "ConsoleRun.h"
-#include "config/T3872Acomcal.h"
 
 using testsupport::ConsoleRun;
 
 namespace {
-
-// Records of a characterization that matches the sample configuration's calibration points.
-long currentRecordCount() {
-    CT3872Acomcal configuration;
-    configuration.SetModel("T3872A");
-    configuration.SetOptions({"010", "080"});
-    configuration.ReadSequence(testsupport::sampleConfiguration().string());
-    long points = 0;
-    for (int band = 0; band <= static_cast<int>(configuration.GetConstant("maxband")); ++band) {
-        points += configuration.GetBandDefaults(band).m_points;
-    }
-    return points;
-}
 
 std::string storedScenario(const std::string& storedJson) {
     return R"({"options": "010,080", "stored": [)" + storedJson + "]}";
@@ -118,7 +104,7 @@ TEST(ThreadedDialogRunRules, PortReceiverWithoutItsStoredReferenceGetsItAddedAnd
 }
 
 TEST(ThreadedDialogRunRules, StoredPortReceiverWithStoredReferenceIsErasedReloadedAndRun) {
-    const long records = currentRecordCount();
+    const long records = testsupport::sampleRecordCount();
     ConsoleRun run(storedScenario(stored("R1", records) + "," + stored("A", records)));
     ASSERT_EQ(run.run("clear\nselect A\nrun\nwait\n", kOperator), 0) << run.err();
     EXPECT_TRUE(run.inOrder({
@@ -136,7 +122,7 @@ TEST(ThreadedDialogRunRules, StoredPortReceiverWithStoredReferenceIsErasedReload
 }
 
 TEST(DialogRunRules, NoToTheDeleteQuestionErasesNothing) {
-    const long records = currentRecordCount();
+    const long records = testsupport::sampleRecordCount();
     ConsoleRun run(storedScenario(stored("R1", records) + "," + stored("A", records)));
     ASSERT_EQ(
         run.run("clear\nselect A\nrun\n", "Delete previous calibrations? = No\nReload now? = No\n"),
@@ -149,7 +135,7 @@ TEST(DialogRunRules, NoToTheDeleteQuestionErasesNothing) {
 }
 
 TEST(DialogRunRules, OldSizedImageOfAnUnselectedReceiverIsAddedErasedAndStops) {
-    const long records = currentRecordCount();
+    const long records = testsupport::sampleRecordCount();
     ConsoleRun run(storedScenario(stored("R1", records) +
                                   R"(,{"receiver": "R2", "age_days": 20, "words": 500})"));
     ASSERT_EQ(run.run("clear\nselect R1\nrun\n", kOperator + "Cal selections adjusted = OK\n"), 0)

@@ -5,7 +5,6 @@
 
 #include "ConsoleRun.h"
 #include "app/CTarvexApp.h"
-#include "config/T3872Acomcal.h"
 #include "scpi/Device.h"
 #include "storage/BackupManifest.h"
 #include "storage/RcvrCharImage.h"
@@ -15,21 +14,9 @@ using testsupport::readFile;
 
 namespace {
 
-long currentRecordCount() {
-    CT3872Acomcal configuration;
-    configuration.SetModel("T3872A");
-    configuration.SetOptions({"010", "080"});
-    configuration.ReadSequence(testsupport::sampleConfiguration().string());
-    long points = 0;
-    for (int band = 0; band <= static_cast<int>(configuration.GetConstant("maxband")); ++band) {
-        points += configuration.GetBandDefaults(band).m_points;
-    }
-    return points;
-}
-
 // R1 and A stored with the current calibration points.
 std::string storedR1AndA() {
-    const std::string records = std::to_string(currentRecordCount());
+    const std::string records = std::to_string(testsupport::sampleRecordCount());
     return R"({"options": "010,080", "stored": [{"receiver": "R1", "age_days": 1, "records": )" +
            records + R"(}, {"receiver": "A", "age_days": 1, "records": )" + records + "}]}";
 }
