@@ -147,7 +147,7 @@ TEST(ThreadedServe, PyvisaAndLxiDriveVxi11ThroughThePortmapper) {
             executable +
             "' serve --port 0 --vxi11 --sim-state state > serve.txt 2>&1 &\n"
             "server=$!\n"
-            "for i in $(seq 100); do grep -q INSTR serve.txt && break; sleep 0.1; done\n"
+            "for i in $(seq 300); do grep -qs INSTR serve.txt && break; sleep 0.1; done\n"
             "timeout 120 /usr/bin/python3 '" +
             clients +
             "/pyvisa_serve.py' "

@@ -35,7 +35,7 @@ const std::string runScript =
     executable + "' serve --port 0 $vxi --scenario '" + scenario +
     "' --sim-state $run-state --trace $run-served.txt > $run-serve.txt 2>&1 &\n"
     "server=$!\n"
-    "for i in $(seq 100); do grep -q \"::$kind\" $run-serve.txt && break; sleep 0.1; done\n"
+    "for i in $(seq 300); do grep -qs \"::$kind\" $run-serve.txt && break; sleep 0.1; done\n"
     "resource=$(grep -o \"^TCPIP::[^ ]*::$kind\" $run-serve.txt)\n"
     "started=$(date +%s%N)\n"
     "'" +
